@@ -1,0 +1,28 @@
+#pragma once
+
+#include <functional>
+
+namespace platform {
+
+// The main queue is the event loop of the thread that created the
+// QCoreApplication (the GUI thread). Only that thread touches views and
+// editor state.
+namespace MainQueue {
+
+// Queues `job` to run on the main thread after the work already queued there.
+// Callable from any thread, including the main thread itself (the job then
+// runs on a later turn of the loop, never inside this call). The job, and
+// everything it captures, lives until it has run. Without a QCoreApplication
+// the job is dropped and an error is logged.
+void async(std::function<void()> job);
+
+// Runs `job` on the main thread and returns when it has finished. On the main
+// thread it runs at once; from another thread the caller blocks until the
+// event loop has run it, so the main thread must not be waiting on the caller.
+void sync(const std::function<void()>& job);
+
+// True on the main thread.
+bool isCurrent();
+
+} // namespace MainQueue
+} // namespace platform

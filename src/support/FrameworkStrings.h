@@ -1,0 +1,15 @@
+#pragma once
+
+#include "platform/services/Bundle.h"
+
+#include <QString>
+#include <memory>
+
+// The bundle of the platform's photo framework (the one holding its album
+// class), looked up once and then cached. Null when it is not installed.
+std::shared_ptr<platform::Bundle> TXQuillonFrameworkBundle();
+
+// The photo framework's text for `key`, searched in its four tables in order
+// (device-specific, general, then two supplementary ones); the key itself when
+// none has it. Callable from any thread.
+QString TXLocalizedFrameworkString(const QString& key);

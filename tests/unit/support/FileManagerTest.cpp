@@ -1,0 +1,215 @@
+// The synchronous operations of the temporary store: set-up, purges, size,
+// creation date and free space.
+
+#include "FileManagerFixture.h"
+
+#include <QDir>
+#include <QFileInfo>
+#include <cmath>
+#include <limits>
+
+using platform::LogLevel;
+
+namespace {
+const QString kPurgeError =
+    QStringLiteral("error in _tqRemoveFile_srDeleteFilesOlderThanTimeToLiveInSeconds, error code: %1");
+}
+
+TEST_F(FileManagerFixture, TempPathIsTheExportedDirectory)
+{
+    EXPECT_EQ(manager->_srTempPath(), QStringLiteral("/private/var/mobile/Library/Tamsel/"));
+    EXPECT_EQ(manager->_srTempPath(), TXScreenRecorderTempDirectory);
+    EXPECT_EQ(TXScreenRecorderRequiredFreeSpace, 100000000u);
+}
+
+TEST(FileManagerSetup, CreatesTheDirectoryAndLeavesAnythingAlreadyThere)
+{
+    testing_support::MobileRoot root;
+    root.makeLibrary(false);
+    testing_support::LogCapture logs;
+    auto manager = FileManager::create(platform::FileSystem::local());
+
+    manager->_srSetupTempDirectory();
+    EXPECT_TRUE(QFileInfo(root.hostPath("Library/Tamsel")).isDir());
+    manager->_srSetupTempDirectory();
+    EXPECT_EQ(logs.lines(), (QList<testing_support::LogLine>{
+                                {LogLevel::Default, "_srSetupTempDirectory"},
+                                {LogLevel::Default, "_srSetupTempDirectory"}}));
+
+    // A plain file of that name is not replaced.
+    QDir(root.hostPath("Library/Tamsel")).removeRecursively();
+    testing_support::writeFile(root.hostPath("Library/Tamsel"), 3);
+    manager->_srSetupTempDirectory();
+    EXPECT_TRUE(QFileInfo(root.hostPath("Library/Tamsel")).isFile());
+    EXPECT_EQ(logs.texts().count(), 3) << logs.texts().join(" | ").toStdString();
+}
+
+TEST(FileManagerSetup, FailureGoesToTheConsoleAndThenTheErrorLog)
+{
+    testing_support::MobileRoot root; // no Library folder: parents are never created
+    testing_support::LogCapture logs;
+    FileManager::create(platform::FileSystem::local())->_srSetupTempDirectory();
+
+    const auto lines = logs.lines();
+    ASSERT_EQ(lines.size(), 3);
+    EXPECT_EQ(lines[0], (testing_support::LogLine{LogLevel::Default, "_srSetupTempDirectory"}));
+    EXPECT_EQ(lines[1].level, LogLevel::Console);
+    EXPECT_TRUE(lines[1].text.startsWith("error: Error Domain=POSIX Code=2 ")) << lines[1].text.toStdString();
+    EXPECT_TRUE(lines[1].text.contains("/private/var/mobile/Library/Tamsel/")) << "logs speak of device paths";
+    EXPECT_EQ(lines[2], (testing_support::LogLine{LogLevel::Error, "error creating temp directory"}));
+    EXPECT_FALSE(QFileInfo::exists(root.hostPath("Library")));
+}
+
+TEST_F(FileManagerFixture, PurgeRemovesOnlyEntriesOlderThanTheTimeToLive)
+{
+    addFile("old.mp4", 1000, 200);
+    addFile("exactly.mp4", 2000, 100);
+    addFile("young.mp4", 4000, 50);
+
+    EXPECT_EQ(manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(100), 1000);
+
+    EXPECT_FALSE(exists("old.mp4"));
+    EXPECT_TRUE(exists("exactly.mp4")) << "an age equal to the time to live is kept";
+    EXPECT_TRUE(exists("young.mp4"));
+    EXPECT_EQ(logs.texts(), (QStringList{"_srDeleteFilesOlderThanTimeToLiveInSeconds: 100", "deleting old file"}));
+}
+
+TEST_F(FileManagerFixture, ZeroAndNegativeTimeToLiveRemoveEverythingAndNaNNothing)
+{
+    struct Case {
+        double timeToLive;
+        qint64 removed;
+        QString logged;
+    };
+    const Case cases[] = {
+        {0.0, 60, "0"},
+        {-1.0, 60, "-1"},
+        {-3.9, 60, "-3"},
+        {std::numeric_limits<double>::quiet_NaN(), 0, "0"},
+    };
+    for (const Case& c : cases) {
+        SCOPED_TRACE(c.timeToLive);
+        addFile("a.mp4", 10, 0); // made "now": only the special values remove it
+        addFile("b.mov", 20, 1);
+        addFile("c", 30, 2);
+        logs.clear();
+
+        EXPECT_EQ(manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(c.timeToLive), c.removed);
+        EXPECT_EQ(logs.texts().first(), "_srDeleteFilesOlderThanTimeToLiveInSeconds: " + c.logged);
+        EXPECT_EQ(QDir(tempHost()).entryList(QDir::Files).size(), c.removed ? 0 : 3);
+        QDir(tempHost()).removeRecursively();
+        root.makeLibrary();
+    }
+}
+
+TEST_F(FileManagerFixture, DeleteAllTempFilesIsThePurgeWithZeroTimeToLive)
+{
+    addFile("a.mp4", 7, 0);
+    QDir().mkpath(tempHost("folder/inner")); // entries are treated alike, folders too
+    EXPECT_GE(manager->_srDeleteAllTempFiles(), 7);
+    EXPECT_TRUE(QDir(tempHost()).isEmpty());
+    EXPECT_EQ(logs.texts().first(), "_srDeleteFilesOlderThanTimeToLiveInSeconds: 0");
+}
+
+TEST_F(FileManagerFixture, PurgeTimeToLiveIsLoggedClampedTo32Bits)
+{
+    manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(1e12);
+    manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(-1e12);
+    EXPECT_EQ(logs.texts(), (QStringList{"_srDeleteFilesOlderThanTimeToLiveInSeconds: 2147483647",
+                                         "_srDeleteFilesOlderThanTimeToLiveInSeconds: -2147483648"}));
+}
+
+TEST_F(FileManagerFixture, PurgeCarriesTheFirstFailureToTheEnd)
+{
+    addFile("a.mp4", 10, 500);
+    addFile("b.mp4", 20, 500);
+    addFile("c.mp4", 40, 500);
+    fileSystem->failRemovalOf("b.mp4", 13);
+
+    EXPECT_EQ(manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(60), 10)
+        << "removals after the failure still happen but are not counted";
+    EXPECT_EQ(fileSystem->removals(), (QStringList{"a.mp4", "b.mp4", "c.mp4"}));
+    EXPECT_FALSE(exists("c.mp4"));
+
+    // Reported after b's removal, after c's attributes and after c's removal.
+    EXPECT_EQ(logs.count(LogLevel::Error, kPurgeError.arg(13)), 3);
+    const auto console = logs.startingWith("error = ");
+    ASSERT_EQ(console.size(), 3);
+    EXPECT_EQ(console[0].level, LogLevel::Console);
+    EXPECT_TRUE(console[0].text.contains("Code=13"));
+}
+
+TEST_F(FileManagerFixture, UnreadableAttributesKeepTheEntryButPoisonTheTotal)
+{
+    addFile("a.mp4", 10, 500);
+    addFile("b.mp4", 20, 500);
+    fileSystem->failAttributesOf("a.mp4");
+
+    EXPECT_EQ(manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(60), 0);
+    EXPECT_TRUE(exists("a.mp4")) << "an entry of unknown age is not older than anything";
+    EXPECT_FALSE(exists("b.mp4"));
+    EXPECT_EQ(logs.count(LogLevel::Error, kPurgeError.arg(5)), 3);
+}
+
+TEST(FileManagerMissingDirectory, PurgeReportsOnceAndRemovesNothing)
+{
+    testing_support::MobileRoot root;
+    testing_support::LogCapture logs;
+    auto manager = FileManager::create(platform::FileSystem::local());
+
+    EXPECT_EQ(manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(0), 0);
+    EXPECT_EQ(logs.count(LogLevel::Error, kPurgeError.arg(2)), 1);
+    EXPECT_EQ(logs.count("deleting old file"), 0);
+
+    platform::ErrorPtr error;
+    EXPECT_EQ(manager->_srSizeOfTempDir(&error), 0);
+    ASSERT_TRUE(error);
+    EXPECT_EQ(error->code(), 2);
+    EXPECT_EQ(manager->_srSizeOfTempDir(nullptr), 0);
+
+    EXPECT_EQ(manager->_srDeviceFreeDiskSpace(), 0u);
+    EXPECT_FALSE(manager->_srDeviceHasSufficientFreeSpaceForRecording());
+}
+
+TEST_F(FileManagerFixture, SizeOfTempDirIsTheDirectoryEntryNotItsContents)
+{
+    addFile("big.mp4", 1 << 20);
+    platform::ErrorPtr error;
+    const std::int64_t size = manager->_srSizeOfTempDir(&error);
+    EXPECT_FALSE(error);
+    EXPECT_EQ(size, std::int64_t(fileSystem->attributesOfItemAtPath(TXScreenRecorderTempDirectory, nullptr)->size));
+    EXPECT_LT(size, 1 << 20);
+}
+
+TEST_F(FileManagerFixture, CreationDateOfAFileOrNone)
+{
+    addFile("clip.mp4", 1);
+    const QDateTime created = manager->_srGetCreationDateForFile(tempUrl("clip.mp4"));
+    ASSERT_TRUE(created.isValid());
+    EXPECT_LT(std::abs(created.secsTo(QDateTime::currentDateTimeUtc())), 600);
+    EXPECT_FALSE(manager->_srGetCreationDateForFile(tempUrl("missing.mp4")).isValid());
+    EXPECT_TRUE(logs.texts().isEmpty());
+}
+
+TEST_F(FileManagerFixture, FreeSpaceIsRead32BitsWideAndMustExceedTheRequirement)
+{
+    struct Case {
+        std::uint64_t reported;
+        std::uint64_t read;
+        bool sufficient;
+    };
+    const std::uint64_t fourGiB = std::uint64_t(1) << 32;
+    const Case cases[] = {
+        {100000000, 100000000, false},
+        {100000001, 100000001, true},
+        {fourGiB + 10, 10, false},
+        {fourGiB + 100000001, 100000001, true},
+        {fourGiB - 1, fourGiB - 1, true},
+    };
+    for (const Case& c : cases) {
+        SCOPED_TRACE(c.reported);
+        fileSystem->setFreeSize(c.reported);
+        EXPECT_EQ(manager->_srDeviceFreeDiskSpace(), c.read);
+        EXPECT_EQ(manager->_srDeviceHasSufficientFreeSpaceForRecording(), c.sufficient);
+    }
+}

@@ -1,0 +1,184 @@
+// Framework strings in the user's language, application display names and
+// the date line, against the string tables the product ships.
+
+#include "support/BundleTXExtensions.h"
+#include "support/DateTXExtensions.h"
+#include "support/FrameworkStrings.h"
+#include "support/TempDir.h"
+
+#include <QDir>
+#include <QFile>
+#include <QLocale>
+#include <QTemporaryDir>
+#include <gtest/gtest.h>
+#include <time.h>
+
+using testing_support::ScopedEnv;
+
+namespace {
+
+// Sets the user's language environment for one test.
+struct Languages : ScopedEnv {
+    explicit Languages(const char* lang, const char* language = nullptr)
+    {
+        unset("LC_ALL");
+        unset("LC_MESSAGES");
+        set("LANG", lang);
+        if (language)
+            set("LANGUAGE", language);
+        else
+            unset("LANGUAGE");
+    }
+};
+
+QString localized(const QString& key)
+{
+    return BundleTXExtensions::_txLocalizedStringFromFrameworkBundleWithKey_bundleID(key, "org.example.Racer");
+}
+
+void writeText(const QString& path, const QByteArray& text)
+{
+    QDir().mkpath(QFileInfo(path).absolutePath());
+    QFile file(path);
+    ASSERT_TRUE(file.open(QIODevice::WriteOnly));
+    file.write(text);
+}
+
+} // namespace
+
+TEST(FrameworkStrings, ARegionFallsBackToItsPlainLanguage)
+{
+    Languages env("de_AT.UTF-8");
+    EXPECT_EQ(localized("DONE"), QStringLiteral("Fertig"));
+    EXPECT_EQ(BundleTXExtensions::_txLocalizedStringFromFrameworkBundleWithKey_bundleID("DONE", "any.other.id"),
+              QStringLiteral("Fertig"))
+        << "the bundle identifier does not change the text";
+}
+
+TEST(FrameworkStrings, WithoutLanguagesOrAMatchTheFrameworksOwnLookupDecides)
+{
+    {
+        Languages env("C");
+        EXPECT_EQ(localized("SAVE"), QStringLiteral("Save"));
+        EXPECT_EQ(localized("NO_SUCH_KEY"), QStringLiteral("NO_SUCH_KEY"));
+    }
+    {
+        // Only the first preferred language is tried by name; the framework's
+        // own lookup then walks the rest of the list.
+        Languages env("it_IT.UTF-8", "it:ja");
+        EXPECT_EQ(localized("CANCEL"), QStringLiteral("キャンセル"));
+    }
+    {
+        Languages env("de_DE.UTF-8");
+        EXPECT_EQ(localized("NO_SUCH_KEY"), QStringLiteral("NO_SUCH_KEY"));
+    }
+}
+
+TEST(FrameworkStrings, EveryShippedLanguageHasEveryKey)
+{
+    const auto english = BundleTXExtensions::localizedDictionaryForLanguage("en");
+    ASSERT_TRUE(english);
+    for (const char* key : {"SHARE_TEXT_FORMAT", "DONE", "CANCEL", "SAVE"})
+        EXPECT_TRUE(english->contains(key)) << key;
+    EXPECT_EQ(english->value("SHARE_TEXT_FORMAT").toString().count("%@"), 2);
+    for (const char* language : {"de", "fr", "es", "ja"}) {
+        SCOPED_TRACE(language);
+        const auto table = BundleTXExtensions::localizedDictionaryForLanguage(language);
+        ASSERT_TRUE(table);
+        EXPECT_EQ(table->keys(), english->keys());
+        EXPECT_EQ(table->value("SHARE_TEXT_FORMAT").toString().count("%@"), 2);
+    }
+    EXPECT_FALSE(BundleTXExtensions::localizedDictionaryForLanguage("xx"));
+
+    const auto photos = TXQuillonFrameworkBundle();
+    ASSERT_TRUE(photos);
+    for (const char* language : {"en", "de", "fr", "es", "ja"}) {
+        Languages env((QByteArray(language) + "_XX.UTF-8").constData());
+        for (const char* key : {"PUBLISHED_VIDEO", "VIEW_BUTTON_TITLE_FORMAT", "FAILED_PUBLISH_VIDEO", "CLOSE"})
+            EXPECT_NE(TXLocalizedFrameworkString(key), QString::fromLatin1(key)) << language << " " << key;
+    }
+}
+
+TEST(FrameworkStrings, PhotoFrameworkTablesAreSearchedInOrder)
+{
+    Languages env("de_DE.UTF-8");
+    EXPECT_EQ(TXLocalizedFrameworkString("CLOSE"), QStringLiteral("Schließen"));
+    // Found only in the last table.
+    EXPECT_EQ(TXLocalizedFrameworkString("VIEW_BUTTON_TITLE_FORMAT"), QStringLiteral("Auf %@ ansehen"));
+    EXPECT_EQ(TXLocalizedFrameworkString("NOT_A_KEY"), QStringLiteral("NOT_A_KEY"));
+    EXPECT_EQ(TXQuillonFrameworkBundle(), TXQuillonFrameworkBundle());
+    EXPECT_EQ(BundleTXExtensions::_txFrameworkBundle(), BundleTXExtensions::_txFrameworkBundle());
+}
+
+TEST(AppNames, DisplayNameComesFromTheInstalledDesktopEntryInTheUsersLanguage)
+{
+    QTemporaryDir home, dirs;
+    ScopedEnv env("XDG_DATA_HOME", home.path().toLocal8Bit());
+    env.set("XDG_DATA_DIRS", dirs.path().toLocal8Bit());
+    writeText(home.path() + "/applications/org.example.Racer.desktop",
+              "[Desktop Entry]\nType=Application\nName=Racer\nName[de]=Rennwagen\nName[fr_CA]=Bolide\n");
+    writeText(dirs.path() + "/applications/org.example.Nameless.desktop", "[Desktop Entry]\nType=Application\n");
+
+    {
+        Languages lang("de_AT.UTF-8");
+        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"), QStringLiteral("Rennwagen"));
+    }
+    {
+        Languages lang("fr_CA.UTF-8");
+        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"), QStringLiteral("Bolide"));
+    }
+    {
+        Languages lang("es_ES.UTF-8");
+        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"), QStringLiteral("Racer"));
+    }
+    const auto nameless = BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Nameless");
+    ASSERT_TRUE(nameless);
+    EXPECT_TRUE(nameless->isEmpty());
+    EXPECT_FALSE(nameless->isNull());
+    EXPECT_FALSE(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Missing"));
+    EXPECT_FALSE(BundleTXExtensions::_txLocalizedAppNameFromBundleID("../applications/org.example.Racer"));
+}
+
+TEST(AppNames, BundleNameEntriesAreTriedInOrder)
+{
+    QTemporaryDir dir;
+    const QString plain = dir.path() + "/Plain.bundle";
+    QDir().mkpath(plain);
+    auto bundle = platform::Bundle::bundleWithPath(plain);
+    ASSERT_TRUE(bundle);
+    EXPECT_EQ(BundleTXExtensions::_txLocalizedAppName(*bundle), QString(""));
+
+    const QString named = dir.path() + "/Named.bundle";
+    writeText(named + "/Info.json", R"({"BundleName": "Short", "BundleDisplayName": "Long Name"})");
+    writeText(named + "/de.lproj/InfoPlist.strings", R"("BundleDisplayName" = "Langer Name";)");
+    bundle = platform::Bundle::bundleWithPath(named);
+    {
+        Languages lang("de_DE.UTF-8");
+        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppName(*bundle), QStringLiteral("Langer Name"));
+    }
+    {
+        Languages lang("C");
+        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppName(*bundle), QStringLiteral("Long Name"));
+    }
+    const QString shortOnly = dir.path() + "/Short.bundle";
+    writeText(shortOnly + "/Info.json", R"({"BundleName": "Short"})");
+    EXPECT_EQ(BundleTXExtensions::_txLocalizedAppName(*platform::Bundle::bundleWithPath(shortOnly)),
+              QStringLiteral("Short"));
+}
+
+TEST(DateLine, IsLocalTimeWithTwelveHourClock)
+{
+    QLocale::setDefault(QLocale(QLocale::English, QLocale::UnitedStates));
+    ScopedEnv env("TZ", "Asia/Tokyo");
+    tzset();
+
+    EXPECT_EQ(DateTXExtensions::_srGetStringFromDate(QDateTime(QDate(2016, 3, 5), QTime(14, 7), Qt::LocalTime)),
+              QStringLiteral("March 5 02:07 PM"));
+    // The same instant given in UTC still reads as the device's local time.
+    EXPECT_EQ(DateTXExtensions::_srGetStringFromDate(QDateTime(QDate(2016, 3, 5), QTime(5, 7), Qt::UTC)),
+              QStringLiteral("March 5 02:07 PM"));
+    EXPECT_EQ(DateTXExtensions::_srGetStringFromDate(QDateTime(QDate(2016, 11, 21), QTime(0, 5), Qt::LocalTime)),
+              QStringLiteral("November 21 12:05 AM"));
+
+    QLocale::setDefault(QLocale::c());
+}
