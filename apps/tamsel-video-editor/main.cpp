@@ -1,5 +1,6 @@
 // The extension process: the editor in a window of its own.
 
+#include "platform/runtime/DevicePaths.h"
 #include "platform/runtime/GlobalQueue.h"
 #include "support/FileManager.h"
 
@@ -18,6 +19,7 @@ int main(int argc, char** argv)
     QApplication app(argc, argv);
     QApplication::setApplicationName(QStringLiteral("tamsel-video-editor"));
 
+    platform::DevicePaths::prepareDevice();
     FileManager::defaultManager()->_srSetupTempDirectory();
 
     QLabel window(QStringLiteral("Tamsel"));

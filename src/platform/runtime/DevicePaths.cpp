@@ -77,6 +77,11 @@ QString toDevice(const QString& hostPath)
     return hostPath;
 }
 
+void prepareDevice()
+{
+    QDir().mkpath(mobileRoot() + QStringLiteral("/Library"));
+}
+
 QString hostPathOfUrl(const QUrl& url)
 {
     return url.isLocalFile() ? toHost(url.toLocalFile()) : QString();

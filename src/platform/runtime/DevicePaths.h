@@ -28,6 +28,10 @@ QString toHost(const QString& path);
 // roots, unchanged otherwise.
 QString toDevice(const QString& hostPath);
 
+// Makes the folders every device has ("/private/var/mobile/Library"), the
+// way a freshly set-up device has them. The applications call it at start.
+void prepareDevice();
+
 // The host path of a file URL (empty for a URL that is not a local file).
 QString hostPathOfUrl(const QUrl& url);
 

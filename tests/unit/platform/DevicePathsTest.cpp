@@ -43,3 +43,12 @@ TEST(DevicePaths, DefaultRootsComeFromXdgAndTheBuild)
     EXPECT_TRUE(DevicePaths::systemRoot().endsWith("share/tamsel/System")) << DevicePaths::systemRoot().toStdString();
     EXPECT_TRUE(QFileInfo(DevicePaths::toHost("/System/Library/Frameworks/Tamsel.framework")).isDir());
 }
+
+TEST(DevicePaths, PreparingTheDeviceMakesItsLibraryFolder)
+{
+    testing_support::MobileRoot root;
+    EXPECT_FALSE(QFileInfo(root.hostPath("Library")).isDir());
+    DevicePaths::prepareDevice();
+    DevicePaths::prepareDevice();
+    EXPECT_TRUE(QFileInfo(root.hostPath("Library")).isDir());
+}
