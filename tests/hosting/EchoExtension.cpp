@@ -1,0 +1,34 @@
+// A stand-in extension for the launcher's tests: it answers a request with the
+// titles of its input items as activity types, ends when dismissed or when
+// the host goes away, and crashes on request.
+
+#include "platform/hosting/AuxiliaryConnection.h"
+#include "platform/hosting/ExtensionEndpoint.h"
+
+#include <QCoreApplication>
+#include <cstdlib>
+
+int main(int argc, char** argv)
+{
+    QCoreApplication app(argc, argv);
+    auto endpoint = platform::ExtensionEndpoint::fromEnvironment();
+    if (!endpoint->hasHost())
+        return 3;
+    auto connection = std::make_shared<platform::AuxiliaryConnection>(
+        endpoint->channel(), platform::InterfaceDescription{"Vendor", {}},
+        platform::InterfaceDescription{"Host", {"extensionDidFinishWithActivityTypes:"}});
+
+    endpoint->onRequest = [&](QList<platform::ExtensionItem> items) {
+        if (app.arguments().contains("--crash"))
+            std::abort();
+        QStringList titles;
+        for (const auto& item : items)
+            titles.append(item.attributedTitle);
+        connection->remoteObjectProxyWithErrorHandler(nullptr)->extensionDidFinishWithActivityTypes(titles);
+    };
+    endpoint->onDismiss = [&] { app.exit(0); };
+    endpoint->onHostGone = [&] { app.exit(7); };
+    const int status = app.exec();
+    connection->flush();
+    return status;
+}

@@ -1,0 +1,73 @@
+// The host side against a real extension process.
+
+#include "platform/hosting/host/ExtensionLauncher.h"
+#include "support/Wait.h"
+
+#include <QCoreApplication>
+#include <gtest/gtest.h>
+#include <optional>
+
+using namespace platform;
+using testing_support::waitUntil;
+
+namespace {
+
+QString echoExtension()
+{
+    return QCoreApplication::applicationDirPath() + "/tamsel_echo_extension";
+}
+
+struct LauncherRun {
+    ExtensionLauncher launcher;
+    QList<QStringList> reports;
+    std::optional<std::pair<int, bool>> ended;
+
+    LauncherRun()
+    {
+        QObject::connect(&launcher, &ExtensionLauncher::extensionDidFinishWithActivityTypes,
+                         [this](const QStringList& types) { reports.append(types); });
+        QObject::connect(&launcher, &ExtensionLauncher::extensionEnded,
+                         [this](int code, bool crashed) { ended = {code, crashed}; });
+    }
+};
+
+QList<ExtensionItem> items(const QStringList& titles)
+{
+    QList<ExtensionItem> out;
+    for (const QString& title : titles)
+        out.append({title, {ItemProvider::withItem(QStringLiteral("value"))}});
+    return out;
+}
+
+} // namespace
+
+TEST(ExtensionLauncher, SendsTheRequestHearsTheReportAndDismisses)
+{
+    LauncherRun run;
+    QString error;
+    ASSERT_TRUE(run.launcher.start(echoExtension(), {}, items({"A", "B"}), &error)) << error.toStdString();
+    ASSERT_TRUE(waitUntil([&] { return !run.reports.isEmpty(); }));
+    EXPECT_EQ(run.reports.first(), (QStringList{"A", "B"}));
+
+    run.launcher.dismiss();
+    ASSERT_TRUE(waitUntil([&] { return run.ended.has_value(); }));
+    EXPECT_EQ(run.ended->first, 0);
+    EXPECT_FALSE(run.ended->second);
+}
+
+TEST(ExtensionLauncher, SurvivesAnExtensionThatCrashes)
+{
+    LauncherRun run;
+    ASSERT_TRUE(run.launcher.start(echoExtension(), {"--crash"}, items({"A"})));
+    ASSERT_TRUE(waitUntil([&] { return run.ended.has_value(); }));
+    EXPECT_TRUE(run.ended->second);
+    EXPECT_TRUE(run.reports.isEmpty());
+}
+
+TEST(ExtensionLauncher, ReportsAProgramThatCannotStart)
+{
+    LauncherRun run;
+    QString error;
+    EXPECT_FALSE(run.launcher.start("/nonexistent/extension", {}, {}, &error));
+    EXPECT_FALSE(error.isEmpty());
+}
