@@ -1,0 +1,67 @@
+#include "scrubber/ScrubberFixture.h"
+
+#include <QAccessible>
+#include <QAccessibleValueInterface>
+
+using testing_support::ScrubberFixture;
+
+TEST_F(ScrubberFixture, ArrowKeysStepThePlayheadByFramesEachAsAWholeScrub) {
+    client->frame = 0.1;
+    scrubber->setValue(0.95);
+    key(Qt::Key_Right);                    // to the next frame boundary
+    key(Qt::Key_Right, Qt::ShiftModifier); // ten frames
+    scrubber->setFrameDuration(0.5);       // the property wins over the data source
+    key(Qt::Key_Left);
+    scrubber->setValue(0.0);
+    key(Qt::Key_Left); // already at the start: nothing to report
+
+    EXPECT_EQ(client->names(),
+              (QStringList{"beginScrubbing", "value", "endScrubbing", "beginScrubbing", "value",
+                           "endScrubbing", "beginScrubbing", "value", "endScrubbing"}));
+    const std::vector<double> values = client->valuesOf("value");
+    ASSERT_EQ(values.size(), 3u);
+    EXPECT_DOUBLE_EQ(values[0], 1.0);
+    EXPECT_DOUBLE_EQ(values[1], 2.0);
+    EXPECT_DOUBLE_EQ(values[2], 1.5);
+}
+
+TEST_F(ScrubberFixture, TabWalksThePartsAndArrowsMoveTheFocusedHandle) {
+    scrubber->setEditable(true);
+    client->frame = 0.5;
+    focus();
+    EXPECT_EQ(scrubber->focusedPart(), platform::MovieScrubberHandle::Playhead);
+
+    key(Qt::Key_Tab);
+    EXPECT_EQ(scrubber->focusedPart(), platform::MovieScrubberHandle::Start);
+    key(Qt::Key_Right);
+    EXPECT_TRUE(scrubber->isEditing());
+    key(Qt::Key_Tab);
+    EXPECT_EQ(scrubber->focusedPart(), platform::MovieScrubberHandle::End);
+    key(Qt::Key_Left, Qt::ShiftModifier); // ten frames of 0.5 s
+    key(Qt::Key_Home);                    // as close to the start as allowed
+    key(Qt::Key_Backtab);
+    key(Qt::Key_End); // the start cannot move: the minimum length holds it
+    key(Qt::Key_Tab);
+    key(Qt::Key_Tab); // past the last part, round to the first
+    EXPECT_EQ(scrubber->focusedPart(), platform::MovieScrubberHandle::Playhead);
+
+    EXPECT_EQ(client->names(), (QStringList{"beginEditing", "start", "end", "end"}));
+    EXPECT_EQ(client->valuesOf("start"), (std::vector<double>{0.5}));
+    EXPECT_EQ(client->valuesOf("end"), (std::vector<double>{5.0, 1.5}));
+}
+
+TEST_F(ScrubberFixture, AssistiveTechnologySeesASliderAtTheFocusedTime) {
+    QAccessibleInterface* access = QAccessible::queryAccessibleInterface(scrubber.get());
+    ASSERT_NE(access, nullptr);
+    EXPECT_EQ(access->role(), QAccessible::Slider);
+    EXPECT_EQ(access->text(QAccessible::Name), QStringLiteral("Movie scrubber"));
+    scrubber->setValue(2.5);
+    EXPECT_EQ(access->text(QAccessible::Value), QStringLiteral("Playhead 0:02.50"));
+
+    QAccessibleValueInterface* value = access->valueInterface();
+    ASSERT_NE(value, nullptr);
+    EXPECT_EQ(value->maximumValue().toDouble(), 10.0);
+    value->setCurrentValue(4.0);
+    EXPECT_EQ(client->names(), (QStringList{"beginScrubbing", "value", "endScrubbing"}));
+    EXPECT_EQ(value->currentValue().toDouble(), 4.0);
+}
