@@ -6,6 +6,6 @@ tamsel_add_tests(tamsel_hosting_tests unit
   LIBS tamsel_platform_hosting)
 
 tamsel_add_tests(tamsel_launcher_tests integration
-  SOURCES hosting/LauncherTest.cpp
+  SOURCES hosting/LauncherTest.cpp hosting/TamselEditTest.cpp
   LIBS tamsel-host)
-add_dependencies(tamsel_launcher_tests tamsel_echo_extension)
+add_dependencies(tamsel_launcher_tests tamsel_echo_extension tamsel-edit)

@@ -1,33 +1,77 @@
-// The host side: starts the editor extension in a process of its own, waits
-// for it and prints the activity types the user completed as a JSON array.
+// The host side: starts the editor extension in a process of its own, hands it
+// the input items, and prints the activity types the user completed as one
+// JSON array on stdout.
 
-#include <QCoreApplication>
+#include "EditOptions.h"
+#include "platform/hosting/host/ExtensionLauncher.h"
+
 #include <QDir>
+#include <QCoreApplication>
 #include <QJsonArray>
 #include <QJsonDocument>
-#include <QProcess>
 #include <cstdio>
+
+namespace {
+
+QString besideMe(const QString& relative)
+{
+    return QDir::cleanPath(QCoreApplication::applicationDirPath() + QLatin1Char('/') + relative);
+}
+
+void print(const QStringList& activityTypes)
+{
+    const QJsonArray array = QJsonArray::fromStringList(activityTypes);
+    std::printf("%s\n", QJsonDocument(array).toJson(QJsonDocument::Compact).constData());
+    std::fflush(stdout);
+}
+
+} // namespace
 
 int main(int argc, char** argv)
 {
     QCoreApplication app(argc, argv);
-    const QString extension =
-        QDir(QCoreApplication::applicationDirPath()).filePath(QStringLiteral("tamsel-video-editor"));
+    const QStringList arguments = app.arguments().mid(1);
+    if (arguments.contains(QLatin1String("--help")) || arguments.contains(QLatin1String("-h"))) {
+        std::printf("%s", qPrintable(EditOptions::usage()));
+        return 0;
+    }
+    QString error;
+    const auto options = EditOptions::parse(arguments, besideMe(QStringLiteral("../share/tamsel/sample/recording.mp4")),
+                                            besideMe(QStringLiteral("tamsel-video-editor")), &error);
+    if (!options) {
+        std::fprintf(stderr, "tamsel-edit: %s\n\n%s", qPrintable(error), qPrintable(EditOptions::usage()));
+        return 2;
+    }
 
-    QProcess process;
-    process.setProcessChannelMode(QProcess::ForwardedChannels);
-    process.start(extension, app.arguments().mid(1));
-    if (!process.waitForStarted()) {
-        std::fprintf(stderr, "tamsel-edit: could not start the editor (%s)\n",
-                     qPrintable(process.errorString()));
+    platform::ExtensionLauncher launcher;
+    std::optional<QStringList> reported;
+    QObject::connect(&launcher, &platform::ExtensionLauncher::extensionDidFinishWithActivityTypes,
+                     [&](const QStringList& activityTypes) {
+                         // The user is done: the host takes the list and closes the editor.
+                         if (reported)
+                             return;
+                         reported = activityTypes;
+                         print(activityTypes);
+                         launcher.dismiss();
+                     });
+    int status = 0;
+    QObject::connect(&launcher, &platform::ExtensionLauncher::extensionEnded, [&](int exitCode, bool crashed) {
+        if (crashed) {
+            std::fprintf(stderr, "tamsel-edit: the editor ended abnormally (%s %d)\n",
+                         launcher.process().exitStatus() == QProcess::CrashExit ? "crash," : "exit status",
+                         exitCode);
+            status = 1;
+        } else if (!reported) {
+            // The window was closed: the editor was dismissed with nothing done.
+            print({});
+        }
+        app.quit();
+    });
+
+    if (!launcher.start(options->extensionProgram, options->extensionArguments, options->inputItems(), &error)) {
+        std::fprintf(stderr, "tamsel-edit: cannot start the editor: %s\n", qPrintable(error));
         return 1;
     }
-    process.waitForFinished(-1);
-    if (process.exitStatus() != QProcess::NormalExit || process.exitCode() != 0) {
-        std::fprintf(stderr, "tamsel-edit: the editor ended abnormally (exit %d)\n", process.exitCode());
-        return 1;
-    }
-    const QJsonArray activityTypes;
-    std::printf("%s\n", QJsonDocument(activityTypes).toJson(QJsonDocument::Compact).constData());
-    return 0;
+    app.exec();
+    return status;
 }

@@ -1,5 +1,7 @@
-// The extension process: the editor in a window of its own.
+// The extension process: the editor in a window of its own, on the request
+// its host sends.
 
+#include "platform/hosting/ExtensionEndpoint.h"
 #include "platform/runtime/DevicePaths.h"
 #include "platform/runtime/GlobalQueue.h"
 #include "support/FileManager.h"
@@ -10,7 +12,7 @@
 
 int main(int argc, char** argv)
 {
-    // Without a display there is nothing to show; run offscreen and leave.
+    // Without a display there is nothing to show; run offscreen.
     const bool headless = qEnvironmentVariableIsEmpty("DISPLAY") &&
                           qEnvironmentVariableIsEmpty("WAYLAND_DISPLAY") &&
                           qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM");
@@ -22,6 +24,11 @@ int main(int argc, char** argv)
     platform::DevicePaths::prepareDevice();
     FileManager::defaultManager()->_srSetupTempDirectory();
 
+    auto endpoint = platform::ExtensionEndpoint::fromEnvironment();
+    // The extension lives as long as its host wants it.
+    endpoint->onDismiss = [&] { app.quit(); };
+    endpoint->onHostGone = [&] { app.quit(); };
+
     QLabel window(QStringLiteral("Tamsel"));
     window.setAlignment(Qt::AlignCenter);
     window.resize(640, 400);
@@ -30,6 +37,7 @@ int main(int argc, char** argv)
         QTimer::singleShot(0, &app, &QCoreApplication::quit);
 
     const int status = app.exec();
+    // Work already queued (a removal, an album write) finishes first.
     platform::GlobalQueue::drain();
     return status;
 }

@@ -19,7 +19,7 @@ int main(int argc, char** argv)
         platform::InterfaceDescription{"Host", {"extensionDidFinishWithActivityTypes:"}});
 
     endpoint->onRequest = [&](QList<platform::ExtensionItem> items) {
-        if (app.arguments().contains("--crash"))
+        if (app.arguments().contains("--crash") || qEnvironmentVariableIsSet("TAMSEL_ECHO_CRASH"))
             std::abort();
         QStringList titles;
         for (const auto& item : items)
