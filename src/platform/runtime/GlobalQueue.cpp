@@ -1,5 +1,8 @@
 #include "GlobalQueue.h"
 
+#include "MainQueue.h"
+
+#include <QCoreApplication>
 #include <QThread>
 #include <QThreadPool>
 
@@ -40,10 +43,16 @@ void async(QueuePriority priority, std::function<void()> job)
 void drain()
 {
     // A job may queue another on either pool, so wait until both stay idle.
+    // On the main thread the loop keeps turning meanwhile: a job may be
+    // waiting for the main queue to run something for it.
+    const bool onMain = MainQueue::isCurrent();
     for (;;) {
-        pool(QueuePriority::Background)->waitForDone();
-        pool(QueuePriority::Default)->waitForDone();
-        if (pool(QueuePriority::Background)->activeThreadCount() == 0 &&
+        bool idle = true;
+        for (auto priority : {QueuePriority::Background, QueuePriority::Default})
+            idle = pool(priority)->waitForDone(onMain ? 10 : -1) && idle;
+        if (onMain)
+            QCoreApplication::processEvents(QEventLoop::AllEvents);
+        if (idle && pool(QueuePriority::Background)->activeThreadCount() == 0 &&
             pool(QueuePriority::Default)->activeThreadCount() == 0)
             return;
     }

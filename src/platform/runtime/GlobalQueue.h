@@ -16,7 +16,8 @@ void async(QueuePriority priority, std::function<void()> job);
 
 // Blocks until every queued job of both pools has finished. The applications
 // call it when they quit, so work already queued (a removal, a move, an album
-// write) is never cut off.
+// write) is never cut off. Called on the main thread, it keeps running the
+// main queue meanwhile, so a job that waits on the main queue can finish.
 void drain();
 
 // True when the calling thread is one of the pools' threads.

@@ -84,3 +84,11 @@ TEST(GlobalQueue, JobsRunOnWorkersAndDrainWaitsForJobsThatQueueMore)
     EXPECT_FALSE(anyOnMain);
     EXPECT_FALSE(GlobalQueue::isWorkerThread());
 }
+
+TEST(GlobalQueue, DrainOnTheMainThreadLetsJobsWaitOnTheMainQueue)
+{
+    std::atomic<bool> ranOnMain{false};
+    GlobalQueue::async(QueuePriority::Default, [&] { MainQueue::sync([&] { ranOnMain = MainQueue::isCurrent(); }); });
+    GlobalQueue::drain();
+    EXPECT_TRUE(ranOnMain);
+}
