@@ -1,0 +1,70 @@
+#pragma once
+
+#include "platform/media/MediaTime.h"
+#include "platform/runtime/Error.h"
+
+#include <QList>
+#include <QSizeF>
+#include <QTransform>
+#include <QUrl>
+
+#include <cstdint>
+#include <memory>
+
+namespace platform {
+
+enum class MediaType { Video, Audio };
+
+// One video or audio track of an asset, as its headers describe it.
+struct AssetTrack {
+    int trackID = 0; // 1-based, in stream order
+    MediaType mediaType = MediaType::Video;
+    QSizeF naturalSize;            // coded size, before the transform
+    QTransform preferredTransform; // from the display matrix (rotation)
+    std::int32_t naturalTimeScale = 0;
+    MediaTimeRange timeRange;
+    double nominalFrameRate = 0;
+};
+
+// A movie file and what its headers say: the tracks, in stream order, and the
+// duration. Immutable once made, so any thread may read it. Streams other than
+// video and audio (data, subtitles, cover art) are not tracks.
+class Asset {
+  public:
+    // Opens the URL (device paths are mapped) and reads its headers
+    // synchronously; never null. Something that is not a movie gives an asset
+    // without tracks, with error() set. Callable from any thread.
+    static std::shared_ptr<Asset> assetWithURL(const QUrl& url);
+
+    const QUrl& url() const;
+    // The host path the URL maps to (empty for a URL that is not a file).
+    const QString& hostPath() const;
+    QList<AssetTrack> tracks() const;
+    QList<AssetTrack> tracksWithMediaType(MediaType type) const;
+    // The longest track's end, at the first video track's timescale (or the
+    // first track's); invalid when there are no tracks.
+    MediaTime duration() const;
+    // True when there is a track whose codec can be decoded here.
+    bool isPlayable() const;
+    // Why the asset has no tracks; null when it opened.
+    ErrorPtr error() const;
+
+  private:
+    Asset() = default;
+
+    QUrl url_;
+    QString hostPath_;
+    QList<AssetTrack> tracks_;
+    MediaTime duration_;
+    bool playable_ = false;
+    ErrorPtr error_;
+};
+
+// The error domain of the media services; codes are FFmpeg's AVERROR values
+// (negative) or the errno of a file operation (negated).
+inline const QString& mediaErrorDomain() {
+    static const QString domain = QStringLiteral("TamselMediaErrorDomain");
+    return domain;
+}
+
+} // namespace platform

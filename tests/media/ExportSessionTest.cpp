@@ -1,0 +1,327 @@
+#include "platform/media/ExportSession.h"
+#include "support/TempDir.h"
+#include "ClipProbe.h"
+#include "MediaFixtures.h"
+#include "platform/media/Asset.h"
+
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
+#include <gtest/gtest.h>
+
+#include <condition_variable>
+#include <mutex>
+#include <thread>
+
+using namespace platform;
+using mediatest::movieFor;
+using mediatest::probeClip;
+using mediatest::scratchPath;
+
+namespace {
+
+// Runs an export and waits for its one completion; records the thread it
+// came on.
+struct ExportRun {
+    explicit ExportRun(std::shared_ptr<ExportSession> s) : session(std::move(s)) {}
+    std::shared_ptr<ExportSession> session;
+    int completions = 0;
+    std::thread::id completionThread;
+
+    bool runAndWait(int timeoutMs = 60000) {
+        std::mutex m;
+        std::condition_variable cv;
+        session->exportAsynchronouslyWithCompletionHandler([&] {
+            std::lock_guard lock(m);
+            ++completions;
+            completionThread = std::this_thread::get_id();
+            cv.notify_all();
+        });
+        std::unique_lock lock(m);
+        return cv.wait_for(lock, std::chrono::milliseconds(timeoutMs),
+                           [&] { return completions > 0; });
+    }
+};
+
+std::shared_ptr<ExportSession> makeSession(const QString& source, const QString& preset,
+                                           const QString& output, double start, double duration) {
+    auto session = ExportSession::exportSessionWithAsset_presetName(
+        Asset::assetWithURL(QUrl::fromLocalFile(source)), preset);
+    session->setOutputURL(QUrl::fromLocalFile(output));
+    session->setOutputFileType(FileTypeMPEG4);
+    session->setTimeRange(MediaTimeRange::make(MediaTime::fromSeconds(start, 600),
+                                               MediaTime::fromSeconds(duration, 600)));
+    return session;
+}
+
+int frameAt(const testmedia::MovieSpec& movieSpec, double seconds) {
+    int index = 0;
+    while (index + 1 < testmedia::frameCount(movieSpec) &&
+           testmedia::frameTime(movieSpec, index + 1) <= seconds + 1e-9)
+        ++index;
+    return index;
+}
+
+bool leftovers(const QString& output) {
+    const QFileInfo info(output);
+    return !QDir(info.absolutePath())
+                .entryList({QStringLiteral(".") + info.fileName() + QStringLiteral("*")},
+                           QDir::Files | QDir::Hidden)
+                .isEmpty();
+}
+
+// The first frame a player shows is the requested one, the clip lasts what
+// was asked, and the audio's bursts fall where the frames say they should.
+void expectFaithfulCut(const testmedia::MovieSpec& movieSpec, const QString& output, double start,
+                       double duration) {
+    const mediatest::ClipInfo clip = probeClip(output);
+    ASSERT_TRUE(clip.opened);
+    ASSERT_FALSE(clip.frames.empty());
+    const double frame = 1.0 / movieSpec.fps;
+    const mediatest::ShownFrame first = clip.frames.front();
+    EXPECT_NEAR(first.seconds, 0.0, 1e-3);
+    EXPECT_EQ(first.index, frameAt(movieSpec, start));
+    EXPECT_NEAR(clip.videoDuration, duration, frame);
+    // The last frame shown is the last one that starts inside the range.
+    EXPECT_EQ(clip.frames.back().index, frameAt(movieSpec, start + duration - 1e-6));
+    if (movieSpec.audio) {
+        ASSERT_FALSE(clip.burstOnsets.empty());
+        EXPECT_NEAR(clip.audioDuration, duration, frame);
+        // Source second N appears at N - start in the clip.
+        for (double onset : clip.burstOnsets) {
+            const double sourceSecond = std::round(onset + start);
+            EXPECT_NEAR(onset, sourceSecond - start, 0.003) << "burst at " << onset;
+        }
+    }
+}
+
+} // namespace
+
+// Both ways of copying: the span copy (the default for a movie like this)
+// and the remuxer it falls back to.
+TEST(ExportSessionPassthrough, StartsBetweenKeyframesAtTheRequestedFrameWithAudioInSync) {
+    testmedia::MovieSpec movieSpec;
+    movieSpec.seconds = 6;
+    movieSpec.keyframeInterval = 60;
+    const QString source = movieFor(movieSpec);
+    for (const char* remux : {"", "1"}) {
+        testing_support::ScopedEnv env("TAMSEL_EXPORT_REMUX", remux);
+        for (const auto& [start, duration] :
+             {std::pair{1.5, 2.0}, std::pair{2.0, 1.9}, std::pair{0.0, 2.5}, std::pair{3.8, 0.5}}) {
+            SCOPED_TRACE(testing::Message() << "remux '" << remux << "' start " << start
+                                            << " duration " << duration);
+            const QString output = scratchPath(QStringLiteral("cut.mp4"));
+            ExportRun run{makeSession(source, ExportPresetPassthrough, output, start, duration)};
+            ASSERT_TRUE(run.runAndWait());
+            ASSERT_EQ(run.session->status(), int(ExportSessionStatus::Completed))
+                << (run.session->error() ? run.session->error()->description().toStdString() : "");
+            EXPECT_EQ(run.completions, 1);
+            EXPECT_NE(run.completionThread, std::this_thread::get_id());
+            EXPECT_EQ(run.session->progress(), 1.0f);
+            EXPECT_FALSE(run.session->error());
+            expectFaithfulCut(movieSpec, output, start, duration);
+            EXPECT_FALSE(leftovers(output));
+        }
+    }
+}
+
+TEST(ExportSessionPassthrough, KeepsRotationAndCopesWithReorderedAndUnevenFrames) {
+    testmedia::MovieSpec movieSpec;
+    movieSpec.width = 240;
+    movieSpec.height = 320;
+    movieSpec.rotationDegrees = 90;
+    movieSpec.seconds = 4;
+    movieSpec.keyframeInterval = 45;
+    movieSpec.variableFrameRate = true;
+    const QString output = scratchPath(QStringLiteral("portrait.mp4"));
+    ExportRun run{makeSession(movieFor(movieSpec), ExportPresetPassthrough, output, 1.2, 1.5)};
+    ASSERT_TRUE(run.runAndWait());
+    ASSERT_EQ(run.session->status(), int(ExportSessionStatus::Completed));
+    const mediatest::ClipInfo clip = probeClip(output);
+    EXPECT_EQ(clip.transform, QTransform(0, 1, -1, 0, 320, 0));
+    EXPECT_EQ(clip.frames.front().index, frameAt(movieSpec, 1.2));
+
+    movieSpec.bFrames = 2;
+    movieSpec.variableFrameRate = false;
+    const QString reordered = scratchPath(QStringLiteral("bframes.mp4"));
+    ExportRun second{makeSession(movieFor(movieSpec), ExportPresetPassthrough, reordered, 1.3, 1.5)};
+    ASSERT_TRUE(second.runAndWait());
+    ASSERT_EQ(second.session->status(), int(ExportSessionStatus::Completed));
+    const mediatest::ClipInfo b = probeClip(reordered);
+    ASSERT_FALSE(b.frames.empty());
+    EXPECT_EQ(b.frames.front().index, frameAt(movieSpec, 1.3));
+    EXPECT_NEAR(b.frames.front().seconds, 0.0, 1e-3);
+    // Frames decoded only as references of the last ones are not shown.
+    EXPECT_NEAR(b.videoDuration, 1.5, 1.0 / movieSpec.fps);
+    EXPECT_EQ(b.frames.back().index, frameAt(movieSpec, 1.3 + 1.5 - 1e-6));
+}
+
+// The editor reloads the trimmed clip, so the next trim cuts a clip that
+// already has a hidden lead of its own.
+TEST(ExportSessionPassthrough, CutsAClipThatWasCutBefore) {
+    testmedia::MovieSpec movieSpec;
+    movieSpec.seconds = 6;
+    movieSpec.keyframeInterval = 60;
+    for (const char* remux : {"", "1"}) {
+        testing_support::ScopedEnv env("TAMSEL_EXPORT_REMUX", remux);
+        SCOPED_TRACE(remux);
+        const QString first = scratchPath(QStringLiteral("first.mp4"));
+        ExportRun run{makeSession(movieFor(movieSpec), ExportPresetPassthrough, first, 1.5, 3.0)};
+        ASSERT_TRUE(run.runAndWait());
+        ASSERT_EQ(run.session->status(), int(ExportSessionStatus::Completed));
+        const QString second = scratchPath(QStringLiteral("second.mp4"));
+        ExportRun again{makeSession(first, ExportPresetPassthrough, second, 0.7, 1.0)};
+        ASSERT_TRUE(again.runAndWait());
+        ASSERT_EQ(again.session->status(), int(ExportSessionStatus::Completed));
+        const mediatest::ClipInfo clip = probeClip(second);
+        ASSERT_FALSE(clip.frames.empty());
+        EXPECT_EQ(clip.frames.front().index, frameAt(movieSpec, 2.2));
+        EXPECT_NEAR(clip.frames.front().seconds, 0.0, 1e-3);
+        EXPECT_EQ(clip.frames.back().index, frameAt(movieSpec, 3.2 - 1e-6));
+        EXPECT_NEAR(clip.videoDuration, 1.0, 1.0 / movieSpec.fps);
+        ASSERT_EQ(clip.burstOnsets.size(), 1u);
+        EXPECT_NEAR(clip.burstOnsets[0], 3.0 - 2.2, 0.003);
+    }
+}
+
+// Audio that begins after the clip does keeps its place: the clip's audio
+// track starts with a gap.
+TEST(ExportSessionPassthrough, KeepsALateAudioTrackInPlace) {
+    testmedia::MovieSpec movieSpec;
+    movieSpec.seconds = 4;
+    movieSpec.audioStart = 0.5;
+    for (const char* remux : {"", "1"}) {
+        testing_support::ScopedEnv env("TAMSEL_EXPORT_REMUX", remux);
+        for (double start : {0.0, 0.2}) {
+            SCOPED_TRACE(testing::Message() << "remux '" << remux << "' start " << start);
+            const QString output = scratchPath(QStringLiteral("late-audio.mp4"));
+            ExportRun run{makeSession(movieFor(movieSpec), ExportPresetPassthrough, output, start, 2.5)};
+            ASSERT_TRUE(run.runAndWait());
+            ASSERT_EQ(run.session->status(), int(ExportSessionStatus::Completed));
+            const mediatest::ClipInfo clip = probeClip(output);
+            ASSERT_EQ(clip.burstOnsets.size(), 2u) << testing::PrintToString(clip.burstOnsets);
+            EXPECT_NEAR(clip.burstOnsets[0], 1.0 - start, 0.003);
+            EXPECT_NEAR(clip.burstOnsets[1], 2.0 - start, 0.003);
+            EXPECT_EQ(clip.frames.front().index, frameAt(movieSpec, start));
+        }
+    }
+}
+
+TEST(ExportSessionPassthrough, ClipsARangeRunningPastTheEnd) {
+    testmedia::MovieSpec movieSpec;
+    movieSpec.seconds = 3;
+    const QString output = scratchPath(QStringLiteral("past-end.mp4"));
+    // As the editor asks after moving the start handle: start s, duration = end handle.
+    ExportRun run{makeSession(movieFor(movieSpec), ExportPresetPassthrough, output, 1.0, 3.0)};
+    ASSERT_TRUE(run.runAndWait());
+    ASSERT_EQ(run.session->status(), int(ExportSessionStatus::Completed));
+    const mediatest::ClipInfo clip = probeClip(output);
+    EXPECT_NEAR(clip.videoDuration, 2.0, 1.0 / movieSpec.fps);
+    EXPECT_EQ(clip.frames.back().index, testmedia::frameCount(movieSpec) - 1);
+}
+
+TEST(ExportSessionFailures, FailCleanlyWithACodeAndLeaveNothing) {
+    testmedia::MovieSpec truncated;
+    truncated.truncated = true;
+    testmedia::MovieSpec good;
+    const QString notAMovie = scratchPath(QStringLiteral("notes.mp4"));
+    {
+        QFile f(notAMovie);
+        ASSERT_TRUE(f.open(QIODevice::WriteOnly));
+        f.write("this is not a movie\n");
+    }
+    struct Case {
+        const char* name;
+        QString source;
+        double start, duration;
+        QString outputDir;
+    };
+    const QString missingDir = scratchPath(QStringLiteral("no-such-dir"));
+    const Case cases[] = {
+        {"truncated recording", movieFor(truncated), 0, 1, {}},
+        {"not a movie", notAMovie, 0, 1, {}},
+        {"range past the end", movieFor(good), 5, 1, {}},
+        {"output folder missing", movieFor(good), 0, 1, missingDir},
+    };
+    for (const Case& c : cases) {
+        SCOPED_TRACE(c.name);
+        const QString output = c.outputDir.isEmpty() ? scratchPath(QStringLiteral("failed.mp4"))
+                                                     : c.outputDir + QStringLiteral("/out.mp4");
+        ExportRun run{makeSession(c.source, ExportPresetPassthrough, output, c.start, c.duration)};
+        ASSERT_TRUE(run.runAndWait());
+        EXPECT_EQ(run.session->status(), int(ExportSessionStatus::Failed));
+        ASSERT_TRUE(run.session->error());
+        EXPECT_NE(run.session->error()->code(), 0);
+        EXPECT_FALSE(QFile::exists(output));
+        EXPECT_EQ(run.completions, 1);
+    }
+    EXPECT_FALSE(ExportSession::exportSessionWithAsset_presetName(
+        Asset::assetWithURL(QUrl::fromLocalFile(movieFor(good))),
+        QStringLiteral("no-such-preset")));
+}
+
+TEST(ExportSessionCancel, LeavesNoFileWhetherCancelledBeforeOrDuring) {
+    testmedia::MovieSpec movieSpec;
+    movieSpec.seconds = 8;
+    const QString source = movieFor(movieSpec);
+    for (const QString& preset : {ExportPresetPassthrough, ExportPresetHighestQuality}) {
+        SCOPED_TRACE(preset.toStdString());
+        const QString output = scratchPath(QStringLiteral("cancelled.mp4"));
+        ExportRun early{makeSession(source, preset, output, 0, 8)};
+        early.session->cancelExport();
+        ASSERT_TRUE(early.runAndWait());
+        EXPECT_EQ(early.session->status(), int(ExportSessionStatus::Cancelled));
+
+        ExportRun during{makeSession(source, preset, output, 0, 8)};
+        std::mutex m;
+        std::condition_variable cv;
+        bool done = false;
+        during.session->exportAsynchronouslyWithCompletionHandler([&] {
+            std::lock_guard lock(m);
+            done = true;
+            cv.notify_all();
+        });
+        // Cancel once the writer is under way (or, on a fast machine, has
+        // finished: then the export stands and the file is whole).
+        while (during.session->status() == int(ExportSessionStatus::Waiting))
+            std::this_thread::yield();
+        during.session->cancelExport();
+        std::unique_lock lock(m);
+        ASSERT_TRUE(cv.wait_for(lock, std::chrono::seconds(60), [&] { return done; }));
+        if (during.session->status() == int(ExportSessionStatus::Cancelled))
+            EXPECT_FALSE(QFile::exists(output));
+        else
+            EXPECT_EQ(during.session->status(), int(ExportSessionStatus::Completed));
+        EXPECT_FALSE(leftovers(output));
+    }
+}
+
+TEST(ExportSessionHighestQuality, ReencodesTheRangeWithTheMixVolume) {
+    testmedia::MovieSpec movieSpec;
+    movieSpec.seconds = 3;
+    movieSpec.rotationDegrees = 270;
+    const QString source = movieFor(movieSpec);
+    const QString output = scratchPath(QStringLiteral("youtube.mp4"));
+    auto session = makeSession(source, ExportPresetHighestQuality, output, 0.5, 2.0);
+    AudioMix mix;
+    for (const AssetTrack& track : session->asset()->tracksWithMediaType(MediaType::Audio)) {
+        AudioMixInputParameters p =
+            AudioMixInputParameters::audioMixInputParametersWithTrack(track);
+        p.volume = 0.25f;
+        mix.inputParameters.append(p);
+    }
+    ASSERT_EQ(mix.inputParameters.size(), 1);
+    session->setAudioMix(mix);
+    ExportRun run{session};
+    ASSERT_TRUE(run.runAndWait(120000));
+    ASSERT_EQ(run.session->status(), int(ExportSessionStatus::Completed))
+        << (run.session->error() ? run.session->error()->description().toStdString() : "");
+    const mediatest::ClipInfo clip = probeClip(output);
+    ASSERT_FALSE(clip.frames.empty());
+    EXPECT_EQ(clip.frames.front().index, frameAt(movieSpec, 0.5));
+    EXPECT_NEAR(clip.frames.front().seconds, 0.0, 1e-3);
+    EXPECT_NEAR(clip.videoDuration, 2.0, 1.0 / movieSpec.fps);
+    EXPECT_EQ(clip.transform, QTransform(0, -1, 1, 0, 0, 320));
+    // The bursts peak at 0.5 in the source; a quarter of that here.
+    EXPECT_NEAR(clip.audioPeak, 0.125, 0.03);
+}
