@@ -1,0 +1,86 @@
+#include "platform/ui/ToolbarItemButton.h"
+
+#include "platform/ui/ToolbarItem.h"
+
+#include <QFontMetrics>
+#include <QPainter>
+
+namespace platform {
+
+ToolbarItemButton::ToolbarItemButton(std::shared_ptr<ToolbarItem> item, QWidget* parent)
+    : QAbstractButton(parent), item_(std::move(item)) {
+    setFocusPolicy(Qt::StrongFocus);
+    setCursor(Qt::PointingHandCursor);
+    connect(this, &QAbstractButton::clicked, this, [this] { item_->trigger(); });
+    connect(item_.get(), &ToolbarItem::changed, this, [this] { refresh(); });
+    refresh();
+}
+
+void ToolbarItemButton::refresh() {
+    setAccessibleName(item_->title());
+    setToolTip(item_->showsIcon() ? item_->title() : QString());
+    setEnabled(item_->isEnabled());
+    QFont f = font();
+    f.setBold(item_->isProminent());
+    setFont(f);
+    updateGeometry();
+    update();
+}
+
+void ToolbarItemButton::setTint(const QColor& tint) {
+    barTint_ = tint;
+    update();
+}
+
+QColor ToolbarItemButton::effectiveTint() const {
+    if (!isEnabled())
+        return QColor(160, 160, 160);
+    if (item_->tintColor().isValid())
+        return item_->tintColor();
+    return barTint_.isValid() ? barTint_ : palette().color(QPalette::Highlight);
+}
+
+QSize ToolbarItemButton::sizeHint() const {
+    if (item_->showsIcon())
+        return QSize(IconSide + 16, 44);
+    const QFontMetrics metrics(font());
+    return QSize(metrics.horizontalAdvance(item_->title()) + 16, 44);
+}
+
+void ToolbarItemButton::paintEvent(QPaintEvent*) {
+    QPainter painter(this);
+    painter.setRenderHint(QPainter::Antialiasing);
+    QColor tint = effectiveTint();
+    if (isDown())
+        tint.setAlphaF(0.35f);
+    const QRectF area = rect();
+
+    if (item_->showsIcon()) {
+        const QMarginsF insets = item_->imageInsets();
+        QRectF slot = area.adjusted(insets.left(), insets.top(), -insets.right(), -insets.bottom());
+        QRectF iconRect(0, 0, IconSide, IconSide);
+        iconRect.moveCenter(slot.center());
+        const qreal ratio = devicePixelRatioF();
+        QPixmap glyph = item_->icon().pixmap(QSize(IconSide, IconSide), ratio);
+        // Icons are templates: their shape, painted in the tint.
+        QImage tinted(glyph.size(), QImage::Format_ARGB32_Premultiplied);
+        tinted.fill(tint);
+        QPainter mask(&tinted);
+        mask.setCompositionMode(QPainter::CompositionMode_DestinationIn);
+        mask.drawPixmap(0, 0, glyph);
+        mask.end();
+        tinted.setDevicePixelRatio(glyph.devicePixelRatio());
+        painter.drawImage(iconRect, tinted);
+    } else {
+        painter.setPen(tint);
+        painter.drawText(area, Qt::AlignCenter | Qt::TextSingleLine, item_->title());
+    }
+    if (hasFocus()) {
+        QColor ring = palette().color(QPalette::Highlight);
+        painter.setPen(QPen(ring, 2));
+        painter.setBrush(Qt::NoBrush);
+        painter.drawRoundedRect(area.adjusted(2, 6, -2, -6), 6, 6);
+    }
+}
+
+} // namespace platform
