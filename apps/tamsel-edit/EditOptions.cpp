@@ -1,18 +1,16 @@
 #include "EditOptions.h"
 
+#include "extension/TXVideoEditorExtensionKeys.h"
+
 #include <QFileInfo>
 
-namespace {
-
-// The keys the extension reads its inputs by.
-const QString kAppNameKey = QStringLiteral("TXVideoEditorExtensionAppNameKey");
-const QString kMovieKey = QStringLiteral("TXVideoEditorExtensionMovieURLKey");
-const QString kBundleIdentifierKey = QStringLiteral("TXVideoEditorExtensionBundleIdentifierKey");
-const QString kAttachmentKey = QStringLiteral("TXVideoEditorExtensionFileAttachmentKey");
-const QString kShareMessageKey = QStringLiteral("TXVideoEditorExtensionOverrideShareMessageKey");
-const QString kTintColorKey = QStringLiteral("TXVideoEditorExtensionOverrideTintColorKey");
-
-} // namespace
+// The host compiles against the extension's exported key constants.
+const QString& kAppNameKey = TXVideoEditorExtensionAppNameKey;
+const QString& kMovieKey = TXVideoEditorExtensionMoviePathKey;
+const QString& kBundleIdentifierKey = TXVideoEditorExtensionBundleIdentifierKey;
+const QString& kAttachmentKey = TXVideoEditorExtensionFileAttachmentKey;
+const QString& kShareMessageKey = TXVideoEditorExtensionOverrideShareMessageKey;
+const QString& kTintColorKey = TXVideoEditorExtensionOverrideTintColorKey;
 
 QString EditOptions::usage()
 {

@@ -1,43 +1,81 @@
 // The extension process: the editor in a window of its own, on the request
-// its host sends.
+// its host (tamsel-edit, or an application through tamsel-host) sends.
 
-#include "platform/hosting/ExtensionEndpoint.h"
+#include "AutomationDriver.h"
+#include "DemoScript.h"
+#include "ExtensionEntry.h"
 #include "platform/runtime/DevicePaths.h"
 #include "platform/runtime/GlobalQueue.h"
+#include "platform/runtime/MainQueue.h"
+#include "platform/ui/Device.h"
 #include "support/FileManager.h"
 
 #include <QApplication>
-#include <QLabel>
+#include <QFile>
 #include <QTimer>
+#include <cstdio>
+#include <optional>
 
 int main(int argc, char** argv)
 {
-    // Without a display there is nothing to show; run offscreen.
-    const bool headless = qEnvironmentVariableIsEmpty("DISPLAY") &&
-                          qEnvironmentVariableIsEmpty("WAYLAND_DISPLAY") &&
+    // Without a display the editor still runs (for automation), offscreen.
+    const bool headless = qEnvironmentVariableIsEmpty("DISPLAY") && qEnvironmentVariableIsEmpty("WAYLAND_DISPLAY") &&
                           qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM");
     if (headless)
         qputenv("QT_QPA_PLATFORM", "offscreen");
     QApplication app(argc, argv);
     QApplication::setApplicationName(QStringLiteral("tamsel-video-editor"));
+    QApplication::setQuitOnLastWindowClosed(false);
+    QStringList arguments = app.arguments();
+    platform::Device::applyDeviceArgument(arguments);
 
+    // An automation script, or the demo's.
+    std::optional<QList<AutomationCommand>> script;
+    if (const qsizetype at = arguments.indexOf(QStringLiteral("--automation")); at >= 0 && at + 1 < arguments.size()) {
+        QFile file(arguments.at(at + 1));
+        if (!file.open(QIODevice::ReadOnly)) {
+            std::fprintf(stderr, "automation: cannot read %s\n", qPrintable(file.fileName()));
+            return 3;
+        }
+        QString error;
+        script = parseAutomationScript(QString::fromUtf8(file.readAll()), &error);
+        if (!script) {
+            std::fprintf(stderr, "automation: %s\n", qPrintable(error));
+            return 3;
+        }
+    } else if (arguments.contains(QStringLiteral("--demo"))) {
+        script = parseAutomationScript(demoScript(), nullptr);
+    }
+
+    auto endpoint = platform::ExtensionEndpoint::fromEnvironment();
+    if (!endpoint->hasHost()) {
+        std::fprintf(stderr, "tamsel-video-editor is started by its host: run tamsel-edit\n");
+        return 2;
+    }
     platform::DevicePaths::prepareDevice();
     FileManager::defaultManager()->_srSetupTempDirectory();
 
-    auto endpoint = platform::ExtensionEndpoint::fromEnvironment();
-    // The extension lives as long as its host wants it.
-    endpoint->onDismiss = [&] { app.quit(); };
-    endpoint->onHostGone = [&] { app.quit(); };
-
-    QLabel window(QStringLiteral("Tamsel"));
-    window.setAlignment(Qt::AlignCenter);
-    window.resize(640, 400);
-    window.show();
-    if (headless || app.arguments().contains(QStringLiteral("--exit")))
-        QTimer::singleShot(0, &app, &QCoreApplication::quit);
-
-    const int status = app.exec();
-    // Work already queued (a removal, an album write) finishes first.
+    int status = 0;
+    {
+        ExtensionEntry entry(std::move(endpoint));
+        QObject::connect(&entry, &ExtensionEntry::ended, &app, &QCoreApplication::quit);
+        std::unique_ptr<AutomationDriver> driver;
+        if (script) {
+            driver = std::make_unique<AutomationDriver>(entry, *script);
+            QObject::connect(&entry, &ExtensionEntry::requestBegan, driver.get(), &AutomationDriver::start);
+        }
+        if (arguments.contains(QStringLiteral("--exit")))
+            QObject::connect(&entry, &ExtensionEntry::requestBegan, &app,
+                             [&entry] { QTimer::singleShot(0, &entry, &ExtensionEntry::endRequest); });
+        status = app.exec();
+        if (driver && driver->failed())
+            status = 3;
+    }
+    // Work already queued (a removal, an album write) finishes first, and so
+    // does work queued for the main thread, which may still hold the editor:
+    // it must go while the application is there.
+    platform::GlobalQueue::drain();
+    platform::MainQueue::runPending();
     platform::GlobalQueue::drain();
     return status;
 }

@@ -3,6 +3,7 @@
 #include "Log.h"
 
 #include <QCoreApplication>
+#include <QEvent>
 #include <QMetaObject>
 #include <QThread>
 
@@ -30,6 +31,16 @@ void sync(const std::function<void()>& job)
         return;
     }
     QMetaObject::invokeMethod(app, job, Qt::BlockingQueuedConnection);
+}
+
+void runPending(int rounds)
+{
+    if (!isCurrent())
+        return;
+    for (int round = 0; round < rounds; ++round) {
+        QCoreApplication::sendPostedEvents();
+        QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
+    }
 }
 
 bool isCurrent()

@@ -24,5 +24,11 @@ void sync(const std::function<void()>& job);
 // True on the main thread.
 bool isCurrent();
 
+// Runs what is queued on the main thread, and what that queues in turn
+// (deferred deletions too), until nothing is left or `rounds` passes have
+// run. Main thread only. Call it before the application object goes: work
+// still queued then would be destroyed inside its destructor.
+void runPending(int rounds = 8);
+
 } // namespace MainQueue
 } // namespace platform

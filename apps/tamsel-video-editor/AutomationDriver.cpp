@@ -1,0 +1,246 @@
+#include "AutomationDriver.h"
+
+#include "EditorSnapshot.h"
+#include "overlay/TXVideoOverlayButton.h"
+#include "platform/runtime/Log.h"
+#include "platform/ui/ViewAlpha.h"
+
+#include <QApplication>
+#include <QDeadlineTimer>
+#include <QJsonDocument>
+#include <QMouseEvent>
+#include <QTimer>
+#include <cstdio>
+
+using namespace platform;
+
+namespace {
+
+void sendMouse(QWidget* widget, QEvent::Type type, const QPointF& local, Qt::MouseButtons buttons)
+{
+    const Qt::MouseButton button = type == QEvent::MouseMove ? Qt::NoButton : Qt::LeftButton;
+    QMouseEvent event(type, local, widget->mapToGlobal(local), button, buttons, Qt::NoModifier);
+    QApplication::sendEvent(widget, &event);
+}
+
+void click(QWidget* widget)
+{
+    const QPointF centre = QRectF(widget->rect()).center();
+    sendMouse(widget, QEvent::MouseButtonPress, centre, Qt::LeftButton);
+    sendMouse(widget, QEvent::MouseButtonRelease, centre, Qt::NoButton);
+}
+
+// A widget the user can see and reach: shown, and not faded out.
+bool reachable(QWidget* widget)
+{
+    for (QWidget* w = widget; w; w = w->parentWidget())
+        if (w->isHidden() || ViewAlpha::alpha(w) < 0.01)
+            return false;
+    return true;
+}
+
+} // namespace
+
+AutomationDriver::AutomationDriver(ExtensionEntry& entry, QList<AutomationCommand> commands)
+    : entry_(entry), commands_(std::move(commands))
+{
+    logObserver_ = addLogObserver([this](LogLevel, const QString& line) {
+        std::lock_guard lock(logMutex_);
+        logLines_.append(line);
+    });
+}
+
+AutomationDriver::~AutomationDriver()
+{
+    removeLogObserver(logObserver_);
+}
+
+TXVideoEditorViewController* AutomationDriver::editor() const
+{
+    const auto& principal = entry_.principal();
+    return principal ? principal->videoEditorViewController.get() : nullptr;
+}
+
+void AutomationDriver::start()
+{
+    QTimer::singleShot(0, this, &AutomationDriver::runNext);
+}
+
+void AutomationDriver::finish(const QString& failure)
+{
+    if (done_)
+        return;
+    done_ = true;
+    if (!failure.isEmpty()) {
+        failed_ = true;
+        const AutomationCommand& c = commands_.at(qMin(next_, int(commands_.size()) - 1));
+        std::fprintf(stderr, "automation: line %d: %s\n", c.line, qPrintable(failure));
+    }
+    entry_.endRequest();
+}
+
+void AutomationDriver::runNext()
+{
+    if (done_)
+        return;
+    if (next_ >= commands_.size()) {
+        finish();
+        return;
+    }
+    const AutomationCommand& c = commands_.at(next_);
+    if (!editor() && c.kind != AutomationCommand::Kind::Wait && c.kind != AutomationCommand::Kind::Sleep) {
+        finish(QStringLiteral("there is no editor yet (wait ready first)"));
+        return;
+    }
+    QString failure;
+    switch (c.kind) {
+    case AutomationCommand::Kind::Tap:
+        failure = tap(c.target);
+        break;
+    case AutomationCommand::Kind::Drag:
+        failure = drag(c.target, c.value);
+        break;
+    case AutomationCommand::Kind::Shake:
+        entry_.window().shake();
+        break;
+    case AutomationCommand::Kind::Resize:
+        entry_.window().resize(int(c.value), int(c.value2));
+        break;
+    case AutomationCommand::Kind::Dump:
+        std::printf("%s\n", QJsonDocument(EditorSnapshot::dump(*editor())).toJson(QJsonDocument::Compact).constData());
+        std::fflush(stdout);
+        break;
+    case AutomationCommand::Kind::Screenshot:
+        if (!entry_.window().grab().save(c.text, "PNG"))
+            failure = QStringLiteral("cannot write %1").arg(c.text);
+        break;
+    case AutomationCommand::Kind::Dismiss:
+        ++next_;
+        finish();
+        return;
+    case AutomationCommand::Kind::Sleep:
+        ++next_;
+        QTimer::singleShot(int(c.value * 1000), this, &AutomationDriver::runNext);
+        return;
+    case AutomationCommand::Kind::Wait:
+        wait(c);
+        return;
+    }
+    if (!failure.isEmpty()) {
+        finish(failure);
+        return;
+    }
+    ++next_;
+    // The next command runs after what this one set off has had a turn.
+    QTimer::singleShot(0, this, &AutomationDriver::runNext);
+}
+
+QString AutomationDriver::tap(const QString& name)
+{
+    TXVideoEditorViewController& e = *editor();
+    QWidget* target = nullptr;
+    if (name == QLatin1String("videoOverlayPlayButton")) {
+        target = e.videoOverlayPlayButtonView.get();
+        if (!target || !target->parentWidget())
+            return QStringLiteral("the overlay play button is not on screen");
+    } else if (name == QLatin1String("videoOverlay")) {
+        target = e.videoOverlay.get();
+    } else {
+        const auto item = EditorSnapshot::itemNamed(e, name);
+        if (!item)
+            return QStringLiteral("no item is called %1").arg(name);
+        for (Toolbar* bar : {e.topToolBar.get(), e.bottomToolBar.get()})
+            if (bar && bar->superview() && !target)
+                target = bar->widgetForItem(item.get());
+        if (!target)
+            return QStringLiteral("%1 is not in a toolbar now").arg(name);
+    }
+    if (!reachable(target))
+        return QStringLiteral("%1 is hidden (tap videoOverlay to show the toolbars)").arg(name);
+    click(target);
+    return QString();
+}
+
+QString AutomationDriver::drag(const QString& part, double seconds)
+{
+    MovieScrubber* scrubber = editor()->avTrimmer.get();
+    if (!reachable(scrubber))
+        return QStringLiteral("the scrubber is hidden (tap videoOverlay to show it)");
+    if (!(scrubber->duration() > 0))
+        return QStringLiteral("the scrubber has no movie yet (wait ready first)");
+    // Presses go where a hand would take each part: a handle by its grip
+    // (outside the range), the playhead anywhere inside the range.
+    double from = 0;
+    double pressX = 0;
+    if (part == QLatin1String("start")) {
+        from = scrubber->startValue();
+        pressX = scrubber->positionForTime(from) - 3;
+    } else if (part == QLatin1String("end")) {
+        from = scrubber->endValue();
+        pressX = scrubber->positionForTime(from) + 3;
+    } else {
+        from = (scrubber->startValue() + scrubber->endValue()) / 2;
+        pressX = scrubber->positionForTime(from);
+    }
+    const double y = scrubber->height() / 2.0;
+    const double toX = pressX + scrubber->positionForTime(seconds) - scrubber->positionForTime(from);
+    sendMouse(scrubber, QEvent::MouseButtonPress, QPointF(pressX, y), Qt::LeftButton);
+    constexpr int steps = 8;
+    for (int i = 1; i <= steps; ++i)
+        sendMouse(scrubber, QEvent::MouseMove, QPointF(pressX + (toX - pressX) * i / steps, y), Qt::LeftButton);
+    sendMouse(scrubber, QEvent::MouseButtonRelease, QPointF(toX, y), Qt::NoButton);
+    return QString();
+}
+
+bool AutomationDriver::holds(const AutomationCommand& c)
+{
+    if (c.target == QLatin1String("log")) {
+        std::lock_guard lock(logMutex_);
+        for (qsizetype i = logCursor_; i < logLines_.size(); ++i) {
+            if (logLines_[i].contains(c.text)) {
+                logCursor_ = i + 1;
+                return true;
+            }
+        }
+        return false;
+    }
+    TXVideoEditorViewController* e = editor();
+    if (!e)
+        return false;
+    const auto& item = e->avPlayer->currentItem();
+    if (c.target == QLatin1String("ready"))
+        return item && item->status() == PlayerItem::Status::ReadyToPlay;
+    if (c.target == QLatin1String("playing"))
+        return e->avPlayer->rate() != 0;
+    if (c.target == QLatin1String("paused"))
+        return e->avPlayer->rate() == 0;
+    if (c.target == QLatin1String("exporting=false"))
+        return !e->isExporting();
+    return false;
+}
+
+void AutomationDriver::wait(const AutomationCommand& c)
+{
+    waiting_ = c;
+    waitDeadline_ = QDeadlineTimer(qint64(c.timeout * 1000));
+    pollWait();
+}
+
+void AutomationDriver::pollWait()
+{
+    if (done_)
+        return;
+    if (holds(waiting_)) {
+        ++next_;
+        QTimer::singleShot(0, this, &AutomationDriver::runNext);
+        return;
+    }
+    if (waitDeadline_.hasExpired()) {
+        const QString what = waiting_.target == QLatin1String("log")
+                                 ? QStringLiteral("log \"%1\"").arg(waiting_.text)
+                                 : waiting_.target;
+        finish(QStringLiteral("waited %1 s for %2 in vain").arg(waiting_.timeout).arg(what));
+        return;
+    }
+    QTimer::singleShot(20, this, &AutomationDriver::pollWait);
+}

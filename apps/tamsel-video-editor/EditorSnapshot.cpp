@@ -1,0 +1,75 @@
+#include "EditorSnapshot.h"
+
+#include <QJsonArray>
+#include <cmath>
+
+using platform::ToolbarItem;
+
+namespace EditorSnapshot {
+namespace {
+
+QList<std::pair<QString, std::shared_ptr<ToolbarItem>>> namedItems(TXVideoEditorViewController& e)
+{
+    return {
+        {QStringLiteral("shareButton"), e.shareButton},   {QStringLiteral("pauseButton"), e.pauseButton},
+        {QStringLiteral("saveButton"), e.saveButton},     {QStringLiteral("flexSpace"), e.flexSpace},
+        {QStringLiteral("doneButton"), e.doneButton},     {QStringLiteral("cancelButton"), e.cancelButton},
+        {QStringLiteral("cancelTrimButton"), e.cancelTrimButton}, {QStringLiteral("trimButton"), e.trimButton},
+        {QStringLiteral("undoButton"), e.undoButton},     {QStringLiteral("titleButton"), e.titleButton},
+        {QStringLiteral("playButton"), e.playButton},     {QStringLiteral("fixSpace"), e.fixSpace},
+    };
+}
+
+QJsonValue seconds(double value)
+{
+    return std::isfinite(value) ? QJsonValue(value) : QJsonValue();
+}
+
+QJsonArray itemNames(TXVideoEditorViewController& editor, const platform::Toolbar* bar)
+{
+    QJsonArray names;
+    for (const auto& item : bar->items())
+        names.append(nameOfItem(editor, item.get()));
+    return names;
+}
+
+} // namespace
+
+std::shared_ptr<ToolbarItem> itemNamed(TXVideoEditorViewController& editor, const QString& name)
+{
+    for (const auto& [itemName, item] : namedItems(editor))
+        if (itemName == name)
+            return item;
+    return nullptr;
+}
+
+QString nameOfItem(TXVideoEditorViewController& editor, const ToolbarItem* item)
+{
+    for (const auto& [itemName, candidate] : namedItems(editor))
+        if (candidate.get() == item)
+            return itemName;
+    return QString();
+}
+
+QJsonObject dump(TXVideoEditorViewController& editor)
+{
+    const bool bottomInView = editor.bottomToolBar && editor.bottomToolBar->superview();
+    return QJsonObject{
+        {QStringLiteral("introMode"), editor.isIntroMode()},
+        {QStringLiteral("trimming"), editor.isTrimming()},
+        {QStringLiteral("exporting"), editor.isExporting()},
+        {QStringLiteral("scrubbing"), editor.isScrubbing()},
+        {QStringLiteral("hasEdit"), editor.hasEdit()},
+        {QStringLiteral("padMode"), editor.isPadMode()},
+        {QStringLiteral("uiHidden"), editor.isUIHidden()},
+        {QStringLiteral("editStartTime"), seconds(editor.editStartTime)},
+        {QStringLiteral("editEndTime"), seconds(editor.editEndTime)},
+        {QStringLiteral("currentTime"), seconds(editor.avPlayer ? editor.avPlayer->currentTime().seconds() : NAN)},
+        {QStringLiteral("videoURL"), editor.videoURL.toLocalFile()},
+        {QStringLiteral("topToolBar"), itemNames(editor, editor.topToolBar.get())},
+        {QStringLiteral("bottomToolBar"), bottomInView ? itemNames(editor, editor.bottomToolBar.get()) : QJsonArray()},
+        {QStringLiteral("activityTypes"), QJsonArray::fromStringList(editor.activityTypes)},
+    };
+}
+
+} // namespace EditorSnapshot

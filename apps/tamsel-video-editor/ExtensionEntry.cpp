@@ -1,0 +1,59 @@
+#include "ExtensionEntry.h"
+
+#include <QCloseEvent>
+#include <QTimer>
+
+using namespace platform;
+
+ExtensionEntry::ExtensionEntry(std::unique_ptr<ExtensionEndpoint> endpoint) : endpoint_(std::move(endpoint))
+{
+    window_.setWindowTitle(QStringLiteral("Tamsel"));
+    window_.resize(960, 600);
+    window_.installEventFilter(this);
+    endpoint_->onRequest = [this](QList<ExtensionItem> items) { beginRequest(items); };
+    endpoint_->onDismiss = [this] { endRequest(); };
+    endpoint_->onHostGone = [this] { endRequest(); };
+}
+
+bool ExtensionEntry::eventFilter(QObject* watched, QEvent* event)
+{
+    if (watched == &window_ && event->type() == QEvent::Close)
+        QTimer::singleShot(0, this, &ExtensionEntry::endRequest);
+    return QObject::eventFilter(watched, event);
+}
+
+ExtensionEntry::~ExtensionEntry()
+{
+    endRequest();
+}
+
+void ExtensionEntry::beginRequest(const QList<ExtensionItem>& inputItems)
+{
+    if (principal_ || ended_)
+        return; // one request per extension process
+    auto connection = std::make_shared<AuxiliaryConnection>(endpoint_->channel(),
+                                                            TXVideoEditorExtensionContext::_extensionAuxiliaryVendorProtocol(),
+                                                            TXVideoEditorExtensionContext::_extensionAuxiliaryHostProtocol());
+    context_ = std::make_shared<TXVideoEditorExtensionContext>(inputItems, connection);
+    principal_ = TXVideoEditorExtensionViewController::create();
+    principal_->extensionContext = context_;
+    context_->setPrincipalObject(principal_);
+    window_.setRootViewController(principal_);
+    window_.show();
+    emit requestBegan();
+}
+
+void ExtensionEntry::endRequest()
+{
+    if (ended_)
+        return;
+    ended_ = true;
+    // The host removes the extension's view: the principal hears it
+    // disappear and tears its editor down.
+    window_.hide();
+    if (principal_ && principal_->appearance() != ViewController::Appearance::Disappeared)
+        principal_->viewDidDisappear(false);
+    if (context_)
+        context_->_auxiliaryConnection()->flush();
+    emit ended();
+}

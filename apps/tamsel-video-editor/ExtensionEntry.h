@@ -1,0 +1,45 @@
+#pragma once
+
+#include "extension/TXVideoEditorExtensionContext.h"
+#include "extension/TXVideoEditorExtensionViewController.h"
+#include "platform/hosting/ExtensionEndpoint.h"
+#include "platform/ui/Window.h"
+
+#include <QObject>
+#include <memory>
+
+// What the platform does for an extension request: it makes the context and
+// the principal view controller and shows the controller in a window of its
+// own. The window closing, the host dismissing the editor and the host going
+// away all end the request. Main thread only.
+class ExtensionEntry : public QObject {
+    Q_OBJECT
+public:
+    explicit ExtensionEntry(std::unique_ptr<platform::ExtensionEndpoint> endpoint);
+    ~ExtensionEntry() override;
+
+    platform::Window& window() { return window_; }
+    const std::shared_ptr<TXVideoEditorExtensionViewController>& principal() const { return principal_; }
+    const std::shared_ptr<TXVideoEditorExtensionContext>& context() const { return context_; }
+
+    // Starts the request as if the host had sent these items.
+    void beginRequest(const QList<platform::ExtensionItem>& inputItems);
+    // Ends the request: the principal's view leaves the screen, queued
+    // messages to the host go out, and `ended` is emitted.
+    void endRequest();
+
+signals:
+    void requestBegan();
+    void ended();
+
+protected:
+    // Closing the window is the host dismissing the editor.
+    bool eventFilter(QObject* watched, QEvent* event) override;
+
+private:
+    std::unique_ptr<platform::ExtensionEndpoint> endpoint_;
+    platform::Window window_;
+    std::shared_ptr<TXVideoEditorExtensionContext> context_;
+    std::shared_ptr<TXVideoEditorExtensionViewController> principal_;
+    bool ended_ = false;
+};

@@ -1,0 +1,48 @@
+#include "AutomationScript.h"
+
+#include <gtest/gtest.h>
+
+using Kind = AutomationCommand::Kind;
+
+TEST(AutomationScript, ReadsEveryCommandWithCommentsQuotesAndDefaults)
+{
+    QString error;
+    const auto script = parseAutomationScript(R"(# a comment
+tap playButton   # and another
+drag end 4.5
+
+wait log "Export # Failed, \"quoted\"" 12
+wait ready
+resize 400 700
+sleep 0.25
+shake
+screenshot /tmp/a.png
+dump
+dismiss
+)",
+                                              &error);
+    ASSERT_TRUE(script) << error.toStdString();
+    ASSERT_EQ(script->size(), 10);
+    EXPECT_EQ((*script)[0].kind, Kind::Tap);
+    EXPECT_EQ((*script)[0].target, "playButton");
+    EXPECT_EQ((*script)[1].line, 3);
+    EXPECT_EQ((*script)[1].target, "end");
+    EXPECT_DOUBLE_EQ((*script)[1].value, 4.5);
+    EXPECT_EQ((*script)[2].text, "Export # Failed, \"quoted\"");
+    EXPECT_DOUBLE_EQ((*script)[2].timeout, 12);
+    EXPECT_DOUBLE_EQ((*script)[3].timeout, 30) << "the default timeout";
+    EXPECT_DOUBLE_EQ((*script)[4].value2, 700);
+    EXPECT_EQ((*script)[7].text, "/tmp/a.png");
+    EXPECT_EQ((*script)[9].kind, Kind::Dismiss);
+}
+
+TEST(AutomationScript, RefusesAnythingElseNamingTheLine)
+{
+    const char* bad[] = {"tap", "tap a b", "drag middle 3", "drag end -1", "drag end soon", "wait forever",
+                         "wait log", "wait ready 0", "resize 400", "sleep nan", "dump now", "frobnicate"};
+    for (const char* line : bad) {
+        QString error;
+        EXPECT_FALSE(parseAutomationScript(QString("dump\n") + line, &error)) << line;
+        EXPECT_TRUE(error.startsWith("line 2: ")) << line << " " << error.toStdString();
+    }
+}

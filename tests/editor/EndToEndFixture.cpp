@@ -1,0 +1,81 @@
+#include "EndToEndFixture.h"
+
+#include "MediaGenerator.h"
+
+#include <QCoreApplication>
+#include <QCryptographicHash>
+#include <QDir>
+#include <QFile>
+#include <QJsonDocument>
+#include <QProcess>
+
+QTemporaryDir* EndToEnd::dir = nullptr;
+
+void EndToEnd::SetUpTestSuite()
+{
+    dir = new QTemporaryDir;
+    testmedia::MovieSpec movieSpec;
+    movieSpec.seconds = 10;
+    movieSpec.keyframeInterval = 30;
+    QString error;
+    ASSERT_TRUE(testmedia::writeMovie(recording(), movieSpec, &error)) << error.toStdString();
+}
+
+void EndToEnd::TearDownTestSuite()
+{
+    delete dir;
+    dir = nullptr;
+}
+
+QByteArray EndToEnd::hashOf(const QString& path)
+{
+    QFile file(path);
+    if (!file.open(QIODevice::ReadOnly))
+        return {};
+    return QCryptographicHash::hash(file.readAll(), QCryptographicHash::Sha256);
+}
+
+EndToEnd::Run EndToEnd::edit(const QString& script, const QString& movie, const QStringList& extra,
+                             const QProcessEnvironment& env)
+{
+    const QString scriptPath = mobile.filePath("script.txt");
+    QFile file(scriptPath);
+    if (file.open(QIODevice::WriteOnly))
+        file.write(script.toUtf8());
+    file.close();
+
+    QProcess process;
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.insert("TAMSEL_MOBILE_ROOT", mobile.path());
+    environment.insert("TAMSEL_ALBUM_DIR", album.path());
+    environment.insert("TAMSEL_AUDIO", "null");
+    if (!environment.contains("DISPLAY"))
+        environment.insert("QT_QPA_PLATFORM", "offscreen");
+    for (const QString& key : env.keys())
+        environment.insert(key, env.value(key));
+    process.setProcessEnvironment(environment);
+    process.start(QCoreApplication::applicationDirPath() + "/tamsel-edit",
+                  QStringList{movie.isEmpty() ? recording() : movie, "--app-name", "Racer", "--bundle-id",
+                              "org.example.Racer", "--automation", scriptPath} + extra);
+    if (!process.waitForFinished(180000))
+        process.kill();
+    Run run{process.exitCode(), process.readAllStandardOutput(), process.readAllStandardError(), {}, {}};
+    for (const QByteArray& line : run.out.split('\n')) {
+        const QJsonDocument json = QJsonDocument::fromJson(line);
+        if (json.isObject())
+            run.dumps.append(json.object());
+        else if (json.isArray())
+            run.hostReport = line;
+    }
+    return run;
+}
+
+QStringList EndToEnd::albumFiles() const
+{
+    return QDir(album.path()).entryList(QDir::Files | QDir::Hidden | QDir::NoDotAndDotDot);
+}
+
+QStringList EndToEnd::tempFiles() const
+{
+    return QDir(mobile.filePath("Library/Tamsel")).entryList(QDir::Files | QDir::Hidden | QDir::NoDotAndDotDot);
+}

@@ -1,0 +1,38 @@
+#pragma once
+
+#include <QByteArray>
+#include <QJsonObject>
+#include <QProcessEnvironment>
+#include <QString>
+#include <QStringList>
+#include <QTemporaryDir>
+#include <gtest/gtest.h>
+
+// Runs tamsel-edit with an automation script on a generated recording, in a
+// device, an album and a temporary directory of its own.
+class EndToEnd : public ::testing::Test {
+protected:
+    struct Run {
+        int exitCode = -1;
+        QByteArray out, err;
+        QList<QJsonObject> dumps; // the script's dump lines, in order
+        QByteArray hostReport;    // the last line: what the host received
+    };
+
+    static void SetUpTestSuite();
+    static void TearDownTestSuite();
+
+    // Runs the script on `movie` (the suite's ten-second recording when
+    // empty); `extra` go to tamsel-edit.
+    Run edit(const QString& script, const QString& movie = QString(), const QStringList& extra = {},
+             const QProcessEnvironment& env = {});
+
+    QStringList albumFiles() const;
+    QStringList tempFiles() const;
+    static QString recording() { return dir->filePath("recording.mp4"); }
+    static QByteArray hashOf(const QString& path);
+
+    static QTemporaryDir* dir;
+    QTemporaryDir mobile;
+    QTemporaryDir album;
+};
