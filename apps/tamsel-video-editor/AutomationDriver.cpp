@@ -210,6 +210,8 @@ bool AutomationDriver::holds(const AutomationCommand& c)
     const auto& item = e->avPlayer->currentItem();
     if (c.target == QLatin1String("ready"))
         return item && item->status() == PlayerItem::Status::ReadyToPlay;
+    if (c.target == QLatin1String("frame"))
+        return e->avPlayerLayer && e->avPlayerLayer->isReadyForDisplay();
     if (c.target == QLatin1String("playing"))
         return e->avPlayer->rate() != 0;
     if (c.target == QLatin1String("paused"))

@@ -109,7 +109,7 @@ std::optional<QList<AutomationCommand>> parseAutomationScript(const QString& tex
                     return fail(QStringLiteral("wait log takes a text"));
                 c.text = w[2];
                 next = 3;
-            } else if (!QStringList{"ready", "playing", "paused", "exporting=false"}.contains(c.target)) {
+            } else if (!QStringList{"ready", "frame", "playing", "paused", "exporting=false"}.contains(c.target)) {
                 return fail(QStringLiteral("cannot wait for %1").arg(c.target));
             }
             if (w.size() > next + 1)

@@ -12,7 +12,7 @@ tap playButton   # and another
 drag end 4.5
 
 wait log "Export # Failed, \"quoted\"" 12
-wait ready
+wait frame
 resize 400 700
 sleep 0.25
 shake
