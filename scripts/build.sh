@@ -1,5 +1,6 @@
 #!/usr/bin/env bash
-# Configures and builds into build/ (Ninja). Extra arguments go to the build.
+# Configures and builds into build/ (Ninja): everything, or the targets named
+# in the arguments.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 if [ ! -f build/build.ninja ]; then
@@ -8,4 +9,8 @@ if [ ! -f build/build.ninja ]; then
   cmake -S . -B build -G Ninja -DCMAKE_BUILD_TYPE=RelWithDebInfo \
     -DTAMSEL_WERROR=$werror -DTAMSEL_BUILD_BENCH=OFF >/dev/null
 fi
-cmake --build build -j"$(nproc)" "$@"
+if [ $# -gt 0 ]; then
+  cmake --build build -j"$(nproc)" --target "$@"
+else
+  cmake --build build -j"$(nproc)"
+fi
