@@ -12,7 +12,9 @@
 #include <QJsonArray>
 #include <QSet>
 #include <QStandardPaths>
+#include <QThread>
 #include <QUrl>
+#include <csignal>
 
 namespace {
 
@@ -192,4 +194,59 @@ TEST_F(EndToEnd, ScreenshotsOfIntroAndEditModeUnderXvfb)
                 colours.insert(shot.pixel(x, y));
         EXPECT_GT(colours.size(), 50) << path.toStdString() << " looks blank";
     }
+}
+
+namespace {
+
+// The pid of a child process of `parent`, or 0.
+qint64 childOf(qint64 parent)
+{
+    QFile children(QString("/proc/%1/task/%1/children").arg(parent));
+    if (!children.open(QIODevice::ReadOnly))
+        return 0;
+    return children.readAll().trimmed().split(' ').first().toLongLong();
+}
+
+// Whether the process is gone (or only a zombie waiting to be reaped).
+bool ended(qint64 pid)
+{
+    QFile status(QString("/proc/%1/status").arg(pid));
+    if (!status.open(QIODevice::ReadOnly))
+        return true;
+    return status.readAll().contains("State:\tZ");
+}
+
+} // namespace
+
+TEST_F(EndToEnd, TheEditorEndsWhenItsHostGoesAway)
+{
+    QFile script(mobile.filePath("idle.txt"));
+    ASSERT_TRUE(script.open(QIODevice::WriteOnly));
+    script.write("wait ready\nsleep 60\n");
+    script.close();
+    QProcess host;
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.insert("TAMSEL_MOBILE_ROOT", mobile.path());
+    environment.insert("TAMSEL_AUDIO", "null");
+    environment.insert("QT_QPA_PLATFORM", "offscreen");
+    host.setProcessEnvironment(environment);
+    host.start(QCoreApplication::applicationDirPath() + "/tamsel-edit", {recording(), "--automation", script.fileName()});
+    ASSERT_TRUE(host.waitForStarted());
+    qint64 extension = 0;
+    for (int i = 0; i < 200 && !extension; ++i) {
+        QThread::msleep(50);
+        extension = childOf(host.processId());
+    }
+    ASSERT_NE(extension, 0) << "the host started no extension";
+    QThread::msleep(500);
+    host.kill(); // no chance to say goodbye
+    host.waitForFinished();
+    bool gone = false;
+    for (int i = 0; i < 200 && !gone; ++i) {
+        QThread::msleep(50);
+        gone = ended(extension);
+    }
+    EXPECT_TRUE(gone) << "the extension outlived its host";
+    if (!gone)
+        ::kill(pid_t(extension), SIGKILL);
 }
