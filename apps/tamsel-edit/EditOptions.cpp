@@ -4,14 +4,6 @@
 
 #include <QFileInfo>
 
-// The host compiles against the extension's exported key constants.
-const QString& kAppNameKey = TXVideoEditorExtensionAppNameKey;
-const QString& kMovieKey = TXVideoEditorExtensionMoviePathKey;
-const QString& kBundleIdentifierKey = TXVideoEditorExtensionBundleIdentifierKey;
-const QString& kAttachmentKey = TXVideoEditorExtensionFileAttachmentKey;
-const QString& kShareMessageKey = TXVideoEditorExtensionOverrideShareMessageKey;
-const QString& kTintColorKey = TXVideoEditorExtensionOverrideTintColorKey;
-
 QString EditOptions::usage()
 {
     return QStringLiteral(
@@ -95,15 +87,15 @@ QList<platform::ExtensionItem> EditOptions::inputItems() const
 {
     using platform::ItemProvider;
     QList<platform::ExtensionItem> items{
-        {kMovieKey, {ItemProvider::withItem(moviePath)}},
-        {kAppNameKey, {ItemProvider::withItem(appName)}},
-        {kBundleIdentifierKey, {ItemProvider::withItem(bundleIdentifier)}},
+        {TXVideoEditorExtensionMoviePathKey, {ItemProvider::withItem(moviePath)}},
+        {TXVideoEditorExtensionAppNameKey, {ItemProvider::withItem(appName)}},
+        {TXVideoEditorExtensionBundleIdentifierKey, {ItemProvider::withItem(bundleIdentifier)}},
     };
     if (!attachmentPath.isEmpty())
-        items.append({kAttachmentKey, {ItemProvider::withItem(attachmentPath)}});
+        items.append({TXVideoEditorExtensionFileAttachmentKey, {ItemProvider::withItem(attachmentPath)}});
     if (!shareMessage.isNull())
-        items.append({kShareMessageKey, {ItemProvider::withItem(shareMessage)}});
+        items.append({TXVideoEditorExtensionOverrideShareMessageKey, {ItemProvider::withItem(shareMessage)}});
     if (tintColor.isValid())
-        items.append({kTintColorKey, {ItemProvider::withItem(tintColor)}});
+        items.append({TXVideoEditorExtensionOverrideTintColorKey, {ItemProvider::withItem(tintColor)}});
     return items;
 }

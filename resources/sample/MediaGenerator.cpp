@@ -1,5 +1,7 @@
 #include "MediaGenerator.h"
 
+#include "platform/media/FFmpegHandles.h"
+
 #include "FramePainter.h"
 
 #include <QDir>
@@ -21,26 +23,10 @@ extern "C" {
 namespace testmedia {
 namespace {
 
-struct CodecCloser {
-    void operator()(AVCodecContext* c) const { avcodec_free_context(&c); }
-};
-struct FrameFreer {
-    void operator()(AVFrame* f) const { av_frame_free(&f); }
-};
-struct PacketFreer {
-    void operator()(AVPacket* p) const { av_packet_free(&p); }
-};
-struct OutputCloser {
-    void operator()(AVFormatContext* oc) const {
-        if (oc->pb)
-            avio_closep(&oc->pb);
-        avformat_free_context(oc);
-    }
-};
-using CodecPtr = std::unique_ptr<AVCodecContext, CodecCloser>;
-using FramePtr = std::unique_ptr<AVFrame, FrameFreer>;
-using PacketPtr = std::unique_ptr<AVPacket, PacketFreer>;
-using OutputPtr = std::unique_ptr<AVFormatContext, OutputCloser>;
+using platform::ffmpeg::CodecPtr;
+using platform::ffmpeg::FramePtr;
+using platform::ffmpeg::OutputPtr;
+using platform::ffmpeg::PacketPtr;
 
 constexpr int kVideoTimescale = 90000;
 

@@ -1,7 +1,7 @@
 #pragma once
 
-// Owners of FFmpeg's contexts, so that no early return leaks one. Internal to
-// the media adapter.
+// Owners of FFmpeg's contexts, so that no early return leaks one. For the
+// media adapter and the test-media generator, nothing else.
 
 #include <memory>
 
