@@ -4,8 +4,7 @@
 
 #include <QFileInfo>
 
-QString EditOptions::usage()
-{
+QString EditOptions::usage() {
     return QStringLiteral(
         "usage: tamsel-edit [MOVIE] [options]\n"
         "Opens the editor on MOVIE (the sample recording when none is given) and\n"
@@ -21,9 +20,9 @@ QString EditOptions::usage()
         "  --extension PROGRAM    the extension to start (default: tamsel-video-editor)\n");
 }
 
-std::optional<EditOptions> EditOptions::parse(const QStringList& arguments, const QString& defaultMovie,
-                                              const QString& defaultExtension, QString* error)
-{
+std::optional<EditOptions> EditOptions::parse(const QStringList& arguments,
+                                              const QString& defaultMovie,
+                                              const QString& defaultExtension, QString* error) {
     EditOptions options;
     options.extensionProgram = defaultExtension;
     QString movie;
@@ -39,10 +38,11 @@ std::optional<EditOptions> EditOptions::parse(const QStringList& arguments, cons
                 return std::nullopt;
             return arguments.at(++i);
         };
-        const bool takesValue = arg == QLatin1String("--app-name") || arg == QLatin1String("--bundle-id") ||
-                                arg == QLatin1String("--attachment") || arg == QLatin1String("--share-message") ||
-                                arg == QLatin1String("--tint-color") || arg == QLatin1String("--automation") ||
-                                arg == QLatin1String("--device") || arg == QLatin1String("--extension");
+        const bool takesValue =
+            arg == QLatin1String("--app-name") || arg == QLatin1String("--bundle-id") ||
+            arg == QLatin1String("--attachment") || arg == QLatin1String("--share-message") ||
+            arg == QLatin1String("--tint-color") || arg == QLatin1String("--automation") ||
+            arg == QLatin1String("--device") || arg == QLatin1String("--extension");
         std::optional<QString> v;
         if (takesValue && !(v = value()))
             return fail(QStringLiteral("%1 needs a value").arg(arg));
@@ -77,14 +77,14 @@ std::optional<EditOptions> EditOptions::parse(const QStringList& arguments, cons
     }
     options.moviePath = QFileInfo(movie.isEmpty() ? defaultMovie : movie).absoluteFilePath();
     if (options.appName.isEmpty())
-        options.appName = movie.isEmpty() ? QStringLiteral("Tamsel Sample") : QFileInfo(movie).completeBaseName();
+        options.appName =
+            movie.isEmpty() ? QStringLiteral("Tamsel Sample") : QFileInfo(movie).completeBaseName();
     if (options.bundleIdentifier.isEmpty())
         options.bundleIdentifier = QStringLiteral("org.tamsel.Sample");
     return options;
 }
 
-QList<platform::ExtensionItem> EditOptions::inputItems() const
-{
+QList<platform::ExtensionItem> EditOptions::inputItems() const {
     using platform::ItemProvider;
     QList<platform::ExtensionItem> items{
         {TXVideoEditorExtensionMoviePathKey, {ItemProvider::withItem(moviePath)}},
@@ -92,10 +92,13 @@ QList<platform::ExtensionItem> EditOptions::inputItems() const
         {TXVideoEditorExtensionBundleIdentifierKey, {ItemProvider::withItem(bundleIdentifier)}},
     };
     if (!attachmentPath.isEmpty())
-        items.append({TXVideoEditorExtensionFileAttachmentKey, {ItemProvider::withItem(attachmentPath)}});
+        items.append(
+            {TXVideoEditorExtensionFileAttachmentKey, {ItemProvider::withItem(attachmentPath)}});
     if (!shareMessage.isNull())
-        items.append({TXVideoEditorExtensionOverrideShareMessageKey, {ItemProvider::withItem(shareMessage)}});
+        items.append({TXVideoEditorExtensionOverrideShareMessageKey,
+                      {ItemProvider::withItem(shareMessage)}});
     if (tintColor.isValid())
-        items.append({TXVideoEditorExtensionOverrideTintColorKey, {ItemProvider::withItem(tintColor)}});
+        items.append(
+            {TXVideoEditorExtensionOverrideTintColorKey, {ItemProvider::withItem(tintColor)}});
     return items;
 }

@@ -21,7 +21,8 @@ struct EditOptions {
     // Parses the arguments (without the program name); nullopt with `error`
     // set when they do not make sense. `defaultMovie` is used when no movie is
     // named.
-    static std::optional<EditOptions> parse(const QStringList& arguments, const QString& defaultMovie,
+    static std::optional<EditOptions> parse(const QStringList& arguments,
+                                            const QString& defaultMovie,
                                             const QString& defaultExtension, QString* error);
 
     // The six input items, in the order a host sends them.

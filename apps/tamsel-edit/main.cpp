@@ -5,21 +5,19 @@
 #include "EditOptions.h"
 #include "platform/hosting/host/ExtensionLauncher.h"
 
-#include <QDir>
 #include <QCoreApplication>
+#include <QDir>
 #include <QJsonArray>
 #include <QJsonDocument>
 #include <cstdio>
 
 namespace {
 
-QString besideMe(const QString& relative)
-{
+QString besideMe(const QString& relative) {
     return QDir::cleanPath(QCoreApplication::applicationDirPath() + QLatin1Char('/') + relative);
 }
 
-void print(const QStringList& activityTypes)
-{
+void print(const QStringList& activityTypes) {
     const QJsonArray array = QJsonArray::fromStringList(activityTypes);
     std::printf("%s\n", QJsonDocument(array).toJson(QJsonDocument::Compact).constData());
     std::fflush(stdout);
@@ -27,8 +25,7 @@ void print(const QStringList& activityTypes)
 
 } // namespace
 
-int main(int argc, char** argv)
-{
+int main(int argc, char** argv) {
     QCoreApplication app(argc, argv);
     const QStringList arguments = app.arguments().mid(1);
     if (arguments.contains(QLatin1String("--help")) || arguments.contains(QLatin1String("-h"))) {
@@ -36,10 +33,12 @@ int main(int argc, char** argv)
         return 0;
     }
     QString error;
-    const auto options = EditOptions::parse(arguments, besideMe(QStringLiteral("../share/tamsel/sample/recording.mp4")),
-                                            besideMe(QStringLiteral("tamsel-video-editor")), &error);
+    const auto options = EditOptions::parse(
+        arguments, besideMe(QStringLiteral("../share/tamsel/sample/recording.mp4")),
+        besideMe(QStringLiteral("tamsel-video-editor")), &error);
     if (!options) {
-        std::fprintf(stderr, "tamsel-edit: %s\n\n%s", qPrintable(error), qPrintable(EditOptions::usage()));
+        std::fprintf(stderr, "tamsel-edit: %s\n\n%s", qPrintable(error),
+                     qPrintable(EditOptions::usage()));
         return 2;
     }
 
@@ -55,20 +54,23 @@ int main(int argc, char** argv)
                          launcher.dismiss();
                      });
     int status = 0;
-    QObject::connect(&launcher, &platform::ExtensionLauncher::extensionEnded, [&](int exitCode, bool crashed) {
-        if (crashed) {
-            std::fprintf(stderr, "tamsel-edit: the editor ended abnormally (%s %d)\n",
-                         launcher.process().exitStatus() == QProcess::CrashExit ? "crash," : "exit status",
-                         exitCode);
-            status = 1;
-        } else if (!reported) {
-            // The window was closed: the editor was dismissed with nothing done.
-            print({});
-        }
-        app.quit();
-    });
+    QObject::connect(
+        &launcher, &platform::ExtensionLauncher::extensionEnded, [&](int exitCode, bool crashed) {
+            if (crashed) {
+                std::fprintf(stderr, "tamsel-edit: the editor ended abnormally (%s %d)\n",
+                             launcher.process().exitStatus() == QProcess::CrashExit ? "crash,"
+                                                                                    : "exit status",
+                             exitCode);
+                status = 1;
+            } else if (!reported) {
+                // The window was closed: the editor was dismissed with nothing done.
+                print({});
+            }
+            app.quit();
+        });
 
-    if (!launcher.start(options->extensionProgram, options->extensionArguments, options->inputItems(), &error)) {
+    if (!launcher.start(options->extensionProgram, options->extensionArguments,
+                        options->inputItems(), &error)) {
         std::fprintf(stderr, "tamsel-edit: cannot start the editor: %s\n", qPrintable(error));
         return 1;
     }

@@ -16,23 +16,20 @@ using namespace platform;
 
 namespace {
 
-void sendMouse(QWidget* widget, QEvent::Type type, const QPointF& local, Qt::MouseButtons buttons)
-{
+void sendMouse(QWidget* widget, QEvent::Type type, const QPointF& local, Qt::MouseButtons buttons) {
     const Qt::MouseButton button = type == QEvent::MouseMove ? Qt::NoButton : Qt::LeftButton;
     QMouseEvent event(type, local, widget->mapToGlobal(local), button, buttons, Qt::NoModifier);
     QApplication::sendEvent(widget, &event);
 }
 
-void click(QWidget* widget)
-{
+void click(QWidget* widget) {
     const QPointF centre = QRectF(widget->rect()).center();
     sendMouse(widget, QEvent::MouseButtonPress, centre, Qt::LeftButton);
     sendMouse(widget, QEvent::MouseButtonRelease, centre, Qt::NoButton);
 }
 
 // A widget the user can see and reach: shown, and not faded out.
-bool reachable(QWidget* widget)
-{
+bool reachable(QWidget* widget) {
     for (QWidget* w = widget; w; w = w->parentWidget())
         if (w->isHidden() || ViewAlpha::alpha(w) < 0.01)
             return false;
@@ -42,32 +39,27 @@ bool reachable(QWidget* widget)
 } // namespace
 
 AutomationDriver::AutomationDriver(ExtensionEntry& entry, QList<AutomationCommand> commands)
-    : entry_(entry), commands_(std::move(commands))
-{
+    : entry_(entry), commands_(std::move(commands)) {
     logObserver_ = addLogObserver([this](LogLevel, const QString& line) {
         std::lock_guard lock(logMutex_);
         logLines_.append(line);
     });
 }
 
-AutomationDriver::~AutomationDriver()
-{
+AutomationDriver::~AutomationDriver() {
     removeLogObserver(logObserver_);
 }
 
-TXVideoEditorViewController* AutomationDriver::editor() const
-{
+TXVideoEditorViewController* AutomationDriver::editor() const {
     const auto& principal = entry_.principal();
     return principal ? principal->videoEditorViewController.get() : nullptr;
 }
 
-void AutomationDriver::start()
-{
+void AutomationDriver::start() {
     QTimer::singleShot(0, this, &AutomationDriver::runNext);
 }
 
-void AutomationDriver::finish(const QString& failure)
-{
+void AutomationDriver::finish(const QString& failure) {
     if (done_)
         return;
     done_ = true;
@@ -79,8 +71,7 @@ void AutomationDriver::finish(const QString& failure)
     entry_.endRequest();
 }
 
-void AutomationDriver::runNext()
-{
+void AutomationDriver::runNext() {
     if (done_)
         return;
     if (next_ >= commands_.size()) {
@@ -88,7 +79,8 @@ void AutomationDriver::runNext()
         return;
     }
     const AutomationCommand& c = commands_.at(next_);
-    if (!editor() && c.kind != AutomationCommand::Kind::Wait && c.kind != AutomationCommand::Kind::Sleep) {
+    if (!editor() && c.kind != AutomationCommand::Kind::Wait &&
+        c.kind != AutomationCommand::Kind::Sleep) {
         finish(QStringLiteral("there is no editor yet (wait ready first)"));
         return;
     }
@@ -107,7 +99,9 @@ void AutomationDriver::runNext()
         entry_.window().resize(int(c.value), int(c.value2));
         break;
     case AutomationCommand::Kind::Dump:
-        std::printf("%s\n", QJsonDocument(EditorSnapshot::dump(*editor())).toJson(QJsonDocument::Compact).constData());
+        std::printf("%s\n", QJsonDocument(EditorSnapshot::dump(*editor()))
+                                .toJson(QJsonDocument::Compact)
+                                .constData());
         std::fflush(stdout);
         break;
     case AutomationCommand::Kind::Screenshot:
@@ -135,8 +129,7 @@ void AutomationDriver::runNext()
     QTimer::singleShot(0, this, &AutomationDriver::runNext);
 }
 
-QString AutomationDriver::tap(const QString& name)
-{
+QString AutomationDriver::tap(const QString& name) {
     TXVideoEditorViewController& e = *editor();
     QWidget* target = nullptr;
     if (name == QLatin1String("videoOverlayPlayButton")) {
@@ -161,8 +154,7 @@ QString AutomationDriver::tap(const QString& name)
     return QString();
 }
 
-QString AutomationDriver::drag(const QString& part, double seconds)
-{
+QString AutomationDriver::drag(const QString& part, double seconds) {
     MovieScrubber* scrubber = editor()->avTrimmer.get();
     if (!reachable(scrubber))
         return QStringLiteral("the scrubber is hidden (tap videoOverlay to show it)");
@@ -183,17 +175,18 @@ QString AutomationDriver::drag(const QString& part, double seconds)
         pressX = scrubber->positionForTime(from);
     }
     const double y = scrubber->height() / 2.0;
-    const double toX = pressX + scrubber->positionForTime(seconds) - scrubber->positionForTime(from);
+    const double toX =
+        pressX + scrubber->positionForTime(seconds) - scrubber->positionForTime(from);
     sendMouse(scrubber, QEvent::MouseButtonPress, QPointF(pressX, y), Qt::LeftButton);
     constexpr int steps = 8;
     for (int i = 1; i <= steps; ++i)
-        sendMouse(scrubber, QEvent::MouseMove, QPointF(pressX + (toX - pressX) * i / steps, y), Qt::LeftButton);
+        sendMouse(scrubber, QEvent::MouseMove, QPointF(pressX + (toX - pressX) * i / steps, y),
+                  Qt::LeftButton);
     sendMouse(scrubber, QEvent::MouseButtonRelease, QPointF(toX, y), Qt::NoButton);
     return QString();
 }
 
-bool AutomationDriver::holds(const AutomationCommand& c)
-{
+bool AutomationDriver::holds(const AutomationCommand& c) {
     if (c.target == QLatin1String("log")) {
         std::lock_guard lock(logMutex_);
         for (qsizetype i = logCursor_; i < logLines_.size(); ++i) {
@@ -221,15 +214,13 @@ bool AutomationDriver::holds(const AutomationCommand& c)
     return false;
 }
 
-void AutomationDriver::wait(const AutomationCommand& c)
-{
+void AutomationDriver::wait(const AutomationCommand& c) {
     waiting_ = c;
     waitDeadline_ = QDeadlineTimer(qint64(c.timeout * 1000));
     pollWait();
 }
 
-void AutomationDriver::pollWait()
-{
+void AutomationDriver::pollWait() {
     if (done_)
         return;
     if (holds(waiting_)) {

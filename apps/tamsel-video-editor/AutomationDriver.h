@@ -18,7 +18,7 @@
 // failed() then says so.
 class AutomationDriver : public QObject {
     Q_OBJECT
-public:
+  public:
     AutomationDriver(ExtensionEntry& entry, QList<AutomationCommand> commands);
     ~AutomationDriver() override;
 
@@ -26,7 +26,7 @@ public:
     void start();
     bool failed() const { return failed_; }
 
-private:
+  private:
     void runNext();
     void finish(const QString& failure = QString());
     TXVideoEditorViewController* editor() const;

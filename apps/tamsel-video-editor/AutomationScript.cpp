@@ -6,15 +6,15 @@
 namespace {
 
 // Splits a line into words; a word in double quotes may hold blanks.
-QStringList words(const QString& line)
-{
+QStringList words(const QString& line) {
     QStringList out;
     static const QRegularExpression word(QStringLiteral(R"re("((?:[^"\\]|\\.)*)"|(\S+))re"));
     for (auto it = word.globalMatch(line); it.hasNext();) {
         const auto match = it.next();
         if (match.capturedStart(1) >= 0) {
             QString quoted = match.captured(1);
-            quoted.replace(QStringLiteral("\\\""), QStringLiteral("\"")).replace(QStringLiteral("\\\\"), QStringLiteral("\\"));
+            quoted.replace(QStringLiteral("\\\""), QStringLiteral("\""))
+                .replace(QStringLiteral("\\\\"), QStringLiteral("\\"));
             out.append(quoted);
         } else {
             out.append(match.captured(2));
@@ -23,8 +23,7 @@ QStringList words(const QString& line)
     return out;
 }
 
-std::optional<double> number(const QString& word, bool positive = false)
-{
+std::optional<double> number(const QString& word, bool positive = false) {
     bool ok = false;
     const double v = word.toDouble(&ok);
     if (!ok || !std::isfinite(v) || v < 0 || (positive && v == 0))
@@ -32,8 +31,7 @@ std::optional<double> number(const QString& word, bool positive = false)
     return v;
 }
 
-QString stripComment(const QString& line)
-{
+QString stripComment(const QString& line) {
     bool quoted = false;
     for (qsizetype i = 0; i < line.size(); ++i) {
         if (line[i] == QLatin1Char('"') && (i == 0 || line[i - 1] != QLatin1Char('\\')))
@@ -46,8 +44,7 @@ QString stripComment(const QString& line)
 
 } // namespace
 
-std::optional<QList<AutomationCommand>> parseAutomationScript(const QString& text, QString* error)
-{
+std::optional<QList<AutomationCommand>> parseAutomationScript(const QString& text, QString* error) {
     QList<AutomationCommand> commands;
     const QStringList lines = text.split(QLatin1Char('\n'));
     for (int n = 0; n < lines.size(); ++n) {
@@ -69,12 +66,15 @@ std::optional<QList<AutomationCommand>> parseAutomationScript(const QString& tex
             c.target = w[1];
         } else if (verb == QLatin1String("drag")) {
             std::optional<double> seconds;
-            if (w.size() != 3 || !QStringList{"playhead", "start", "end"}.contains(w[1]) || !(seconds = number(w[2])))
-                return fail(QStringLiteral("drag takes playhead, start or end and a time in seconds"));
+            if (w.size() != 3 || !QStringList{"playhead", "start", "end"}.contains(w[1]) ||
+                !(seconds = number(w[2])))
+                return fail(
+                    QStringLiteral("drag takes playhead, start or end and a time in seconds"));
             c.kind = AutomationCommand::Kind::Drag;
             c.target = w[1];
             c.value = *seconds;
-        } else if (verb == QLatin1String("shake") || verb == QLatin1String("dump") || verb == QLatin1String("dismiss")) {
+        } else if (verb == QLatin1String("shake") || verb == QLatin1String("dump") ||
+                   verb == QLatin1String("dismiss")) {
             if (w.size() != 1)
                 return fail(QStringLiteral("%1 takes nothing").arg(verb));
             c.kind = verb == QLatin1String("shake")  ? AutomationCommand::Kind::Shake
@@ -109,7 +109,8 @@ std::optional<QList<AutomationCommand>> parseAutomationScript(const QString& tex
                     return fail(QStringLiteral("wait log takes a text"));
                 c.text = w[2];
                 next = 3;
-            } else if (!QStringList{"ready", "frame", "playing", "paused", "exporting=false"}.contains(c.target)) {
+            } else if (!QStringList{"ready", "frame", "playing", "paused", "exporting=false"}
+                            .contains(c.target)) {
                 return fail(QStringLiteral("cannot wait for %1").arg(c.target));
             }
             if (w.size() > next + 1)

@@ -8,11 +8,12 @@
 struct AutomationCommand {
     enum class Kind { Tap, Drag, Shake, Resize, Sleep, Wait, Dump, Dismiss, Screenshot };
     Kind kind = Kind::Dump;
-    int line = 0;      // 1-based line in the script
-    QString target;    // tap: item name; drag: playhead|start|end; wait: ready|playing|paused|exporting=false|log
-    QString text;      // wait log: the text to look for; screenshot: the file
-    double value = 0;  // drag: seconds; sleep: seconds; resize: width
-    double value2 = 0; // resize: height
+    int line = 0;        // 1-based line in the script
+    QString target;      // tap: item name; drag: playhead|start|end; wait:
+                         // ready|playing|paused|exporting=false|log
+    QString text;        // wait log: the text to look for; screenshot: the file
+    double value = 0;    // drag: seconds; sleep: seconds; resize: width
+    double value2 = 0;   // resize: height
     double timeout = 30; // wait: seconds
 };
 

@@ -4,8 +4,7 @@
 
 // The typical use of the editor, as an automation script: play the recording
 // to its end, trim its end, play the range, save the clip, done.
-inline QString demoScript()
-{
+inline QString demoScript() {
     return QStringLiteral(R"(# The typical use, on the sample recording.
 wait ready 30
 tap videoOverlayPlayButton

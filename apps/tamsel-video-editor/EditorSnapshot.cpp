@@ -8,25 +8,28 @@ using platform::ToolbarItem;
 namespace EditorSnapshot {
 namespace {
 
-QList<std::pair<QString, std::shared_ptr<ToolbarItem>>> namedItems(TXVideoEditorViewController& e)
-{
+QList<std::pair<QString, std::shared_ptr<ToolbarItem>>> namedItems(TXVideoEditorViewController& e) {
     return {
-        {QStringLiteral("shareButton"), e.shareButton},   {QStringLiteral("pauseButton"), e.pauseButton},
-        {QStringLiteral("saveButton"), e.saveButton},     {QStringLiteral("flexSpace"), e.flexSpace},
-        {QStringLiteral("doneButton"), e.doneButton},     {QStringLiteral("cancelButton"), e.cancelButton},
-        {QStringLiteral("cancelTrimButton"), e.cancelTrimButton}, {QStringLiteral("trimButton"), e.trimButton},
-        {QStringLiteral("undoButton"), e.undoButton},     {QStringLiteral("titleButton"), e.titleButton},
-        {QStringLiteral("playButton"), e.playButton},     {QStringLiteral("fixSpace"), e.fixSpace},
+        {QStringLiteral("shareButton"), e.shareButton},
+        {QStringLiteral("pauseButton"), e.pauseButton},
+        {QStringLiteral("saveButton"), e.saveButton},
+        {QStringLiteral("flexSpace"), e.flexSpace},
+        {QStringLiteral("doneButton"), e.doneButton},
+        {QStringLiteral("cancelButton"), e.cancelButton},
+        {QStringLiteral("cancelTrimButton"), e.cancelTrimButton},
+        {QStringLiteral("trimButton"), e.trimButton},
+        {QStringLiteral("undoButton"), e.undoButton},
+        {QStringLiteral("titleButton"), e.titleButton},
+        {QStringLiteral("playButton"), e.playButton},
+        {QStringLiteral("fixSpace"), e.fixSpace},
     };
 }
 
-QJsonValue seconds(double value)
-{
+QJsonValue seconds(double value) {
     return std::isfinite(value) ? QJsonValue(value) : QJsonValue();
 }
 
-QJsonArray itemNames(TXVideoEditorViewController& editor, const platform::Toolbar* bar)
-{
+QJsonArray itemNames(TXVideoEditorViewController& editor, const platform::Toolbar* bar) {
     QJsonArray names;
     for (const auto& item : bar->items())
         names.append(nameOfItem(editor, item.get()));
@@ -35,24 +38,21 @@ QJsonArray itemNames(TXVideoEditorViewController& editor, const platform::Toolba
 
 } // namespace
 
-std::shared_ptr<ToolbarItem> itemNamed(TXVideoEditorViewController& editor, const QString& name)
-{
+std::shared_ptr<ToolbarItem> itemNamed(TXVideoEditorViewController& editor, const QString& name) {
     for (const auto& [itemName, item] : namedItems(editor))
         if (itemName == name)
             return item;
     return nullptr;
 }
 
-QString nameOfItem(TXVideoEditorViewController& editor, const ToolbarItem* item)
-{
+QString nameOfItem(TXVideoEditorViewController& editor, const ToolbarItem* item) {
     for (const auto& [itemName, candidate] : namedItems(editor))
         if (candidate.get() == item)
             return itemName;
     return QString();
 }
 
-QJsonObject dump(TXVideoEditorViewController& editor)
-{
+QJsonObject dump(TXVideoEditorViewController& editor) {
     const bool bottomInView = editor.bottomToolBar && editor.bottomToolBar->superview();
     return QJsonObject{
         {QStringLiteral("introMode"), editor.isIntroMode()},
@@ -64,10 +64,12 @@ QJsonObject dump(TXVideoEditorViewController& editor)
         {QStringLiteral("uiHidden"), editor.isUIHidden()},
         {QStringLiteral("editStartTime"), seconds(editor.editStartTime)},
         {QStringLiteral("editEndTime"), seconds(editor.editEndTime)},
-        {QStringLiteral("currentTime"), seconds(editor.avPlayer ? editor.avPlayer->currentTime().seconds() : NAN)},
+        {QStringLiteral("currentTime"),
+         seconds(editor.avPlayer ? editor.avPlayer->currentTime().seconds() : NAN)},
         {QStringLiteral("videoURL"), editor.videoURL.toLocalFile()},
         {QStringLiteral("topToolBar"), itemNames(editor, editor.topToolBar.get())},
-        {QStringLiteral("bottomToolBar"), bottomInView ? itemNames(editor, editor.bottomToolBar.get()) : QJsonArray()},
+        {QStringLiteral("bottomToolBar"),
+         bottomInView ? itemNames(editor, editor.bottomToolBar.get()) : QJsonArray()},
         {QStringLiteral("activityTypes"), QJsonArray::fromStringList(editor.activityTypes)},
     };
 }

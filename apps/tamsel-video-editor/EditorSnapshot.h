@@ -11,7 +11,8 @@
 namespace EditorSnapshot {
 
 // The item the editor holds under `name` ("playButton", ...), or null.
-std::shared_ptr<platform::ToolbarItem> itemNamed(TXVideoEditorViewController& editor, const QString& name);
+std::shared_ptr<platform::ToolbarItem> itemNamed(TXVideoEditorViewController& editor,
+                                                 const QString& name);
 // The property name of `item` ("" for an item the editor does not hold).
 QString nameOfItem(TXVideoEditorViewController& editor, const platform::ToolbarItem* item);
 // introMode, trimming, exporting, scrubbing, hasEdit, padMode, uiHidden,

@@ -5,8 +5,8 @@
 
 using namespace platform;
 
-ExtensionEntry::ExtensionEntry(std::unique_ptr<ExtensionEndpoint> endpoint) : endpoint_(std::move(endpoint))
-{
+ExtensionEntry::ExtensionEntry(std::unique_ptr<ExtensionEndpoint> endpoint)
+    : endpoint_(std::move(endpoint)) {
     window_.setWindowTitle(QStringLiteral("Tamsel"));
     window_.resize(960, 600);
     window_.installEventFilter(this);
@@ -15,25 +15,22 @@ ExtensionEntry::ExtensionEntry(std::unique_ptr<ExtensionEndpoint> endpoint) : en
     endpoint_->onHostGone = [this] { endRequest(); };
 }
 
-bool ExtensionEntry::eventFilter(QObject* watched, QEvent* event)
-{
+bool ExtensionEntry::eventFilter(QObject* watched, QEvent* event) {
     if (watched == &window_ && event->type() == QEvent::Close)
         QTimer::singleShot(0, this, &ExtensionEntry::endRequest);
     return QObject::eventFilter(watched, event);
 }
 
-ExtensionEntry::~ExtensionEntry()
-{
+ExtensionEntry::~ExtensionEntry() {
     endRequest();
 }
 
-void ExtensionEntry::beginRequest(const QList<ExtensionItem>& inputItems)
-{
+void ExtensionEntry::beginRequest(const QList<ExtensionItem>& inputItems) {
     if (principal_ || ended_)
         return; // one request per extension process
-    auto connection = std::make_shared<AuxiliaryConnection>(endpoint_->channel(),
-                                                            TXVideoEditorExtensionContext::_extensionAuxiliaryVendorProtocol(),
-                                                            TXVideoEditorExtensionContext::_extensionAuxiliaryHostProtocol());
+    auto connection = std::make_shared<AuxiliaryConnection>(
+        endpoint_->channel(), TXVideoEditorExtensionContext::_extensionAuxiliaryVendorProtocol(),
+        TXVideoEditorExtensionContext::_extensionAuxiliaryHostProtocol());
     context_ = std::make_shared<TXVideoEditorExtensionContext>(inputItems, connection);
     principal_ = TXVideoEditorExtensionViewController::create();
     principal_->extensionContext = context_;
@@ -43,8 +40,7 @@ void ExtensionEntry::beginRequest(const QList<ExtensionItem>& inputItems)
     emit requestBegan();
 }
 
-void ExtensionEntry::endRequest()
-{
+void ExtensionEntry::endRequest() {
     if (ended_)
         return;
     ended_ = true;

@@ -14,12 +14,14 @@
 // away all end the request. Main thread only.
 class ExtensionEntry : public QObject {
     Q_OBJECT
-public:
+  public:
     explicit ExtensionEntry(std::unique_ptr<platform::ExtensionEndpoint> endpoint);
     ~ExtensionEntry() override;
 
     platform::Window& window() { return window_; }
-    const std::shared_ptr<TXVideoEditorExtensionViewController>& principal() const { return principal_; }
+    const std::shared_ptr<TXVideoEditorExtensionViewController>& principal() const {
+        return principal_;
+    }
     const std::shared_ptr<TXVideoEditorExtensionContext>& context() const { return context_; }
 
     // Starts the request as if the host had sent these items.
@@ -28,15 +30,15 @@ public:
     // messages to the host go out, and `ended` is emitted.
     void endRequest();
 
-signals:
+  signals:
     void requestBegan();
     void ended();
 
-protected:
+  protected:
     // Closing the window is the host dismissing the editor.
     bool eventFilter(QObject* watched, QEvent* event) override;
 
-private:
+  private:
     std::unique_ptr<platform::ExtensionEndpoint> endpoint_;
     platform::Window window_;
     std::shared_ptr<TXVideoEditorExtensionContext> context_;

@@ -16,10 +16,10 @@
 #include <cstdio>
 #include <optional>
 
-int main(int argc, char** argv)
-{
+int main(int argc, char** argv) {
     // Without a display the editor still runs (for automation), offscreen.
-    const bool headless = qEnvironmentVariableIsEmpty("DISPLAY") && qEnvironmentVariableIsEmpty("WAYLAND_DISPLAY") &&
+    const bool headless = qEnvironmentVariableIsEmpty("DISPLAY") &&
+                          qEnvironmentVariableIsEmpty("WAYLAND_DISPLAY") &&
                           qEnvironmentVariableIsEmpty("QT_QPA_PLATFORM");
     if (headless)
         qputenv("QT_QPA_PLATFORM", "offscreen");
@@ -31,7 +31,8 @@ int main(int argc, char** argv)
 
     // An automation script, or the demo's.
     std::optional<QList<AutomationCommand>> script;
-    if (const qsizetype at = arguments.indexOf(QStringLiteral("--automation")); at >= 0 && at + 1 < arguments.size()) {
+    if (const qsizetype at = arguments.indexOf(QStringLiteral("--automation"));
+        at >= 0 && at + 1 < arguments.size()) {
         QFile file(arguments.at(at + 1));
         if (!file.open(QIODevice::ReadOnly)) {
             std::fprintf(stderr, "automation: cannot read %s\n", qPrintable(file.fileName()));
@@ -62,11 +63,13 @@ int main(int argc, char** argv)
         std::unique_ptr<AutomationDriver> driver;
         if (script) {
             driver = std::make_unique<AutomationDriver>(entry, *script);
-            QObject::connect(&entry, &ExtensionEntry::requestBegan, driver.get(), &AutomationDriver::start);
+            QObject::connect(&entry, &ExtensionEntry::requestBegan, driver.get(),
+                             &AutomationDriver::start);
         }
         if (arguments.contains(QStringLiteral("--exit")))
-            QObject::connect(&entry, &ExtensionEntry::requestBegan, &app,
-                             [&entry] { QTimer::singleShot(0, &entry, &ExtensionEntry::endRequest); });
+            QObject::connect(&entry, &ExtensionEntry::requestBegan, &app, [&entry] {
+                QTimer::singleShot(0, &entry, &ExtensionEntry::endRequest);
+            });
         status = app.exec();
         if (driver && driver->failed())
             status = 3;

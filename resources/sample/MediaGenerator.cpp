@@ -90,7 +90,8 @@ class AudioSynth {
 
 class Writer {
   public:
-    Writer(const QString& path, const MovieSpec& movieSpec) : path_(path), spec_(movieSpec), synth_(movieSpec) {}
+    Writer(const QString& path, const MovieSpec& movieSpec)
+        : path_(path), spec_(movieSpec), synth_(movieSpec) {}
 
     bool run(QString* error, const std::function<void(double)>& progress) {
         if (!open())

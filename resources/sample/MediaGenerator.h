@@ -36,7 +36,7 @@ struct MovieSpec {
     int crf = 23;
     bool scene = false; // a calm desktop-like scene instead of the test pattern
     int audioSampleRate = 48000;
-    double audioStart = 0;    // the audio track begins this many seconds in
+    double audioStart = 0; // the audio track begins this many seconds in
 };
 
 // Writes the movie to `hostPath` (replacing a file there). Returns false and

@@ -70,8 +70,8 @@ int main(int argc, char** argv) {
 
     const bool showProgress = !parser.isSet(quiet);
     QString error;
-    const bool written =
-        testmedia::writeMovie(parser.positionalArguments().first(), movieSpec, &error, [&](double done) {
+    const bool written = testmedia::writeMovie(
+        parser.positionalArguments().first(), movieSpec, &error, [&](double done) {
             if (showProgress)
                 std::fprintf(stderr, "\r%3d%%", static_cast<int>(done * 100));
         });

@@ -21,34 +21,28 @@ const MediaTime kPlayheadInterval = MediaTime::fromSeconds(0.033333333333333333,
 std::shared_ptr<TXVideoEditorViewController>
 TXVideoEditorViewController::initWithBundleIdentifier_URL_applicationName_overrideTintColor(
     const QString& bundleIdentifier, const QUrl& url, const QString& applicationName,
-    const QColor& overrideTintColor)
-{
+    const QColor& overrideTintColor) {
     auto editor = std::shared_ptr<TXVideoEditorViewController>(new TXVideoEditorViewController);
     editor->init(bundleIdentifier, url, applicationName, overrideTintColor);
     return editor;
 }
 
 std::shared_ptr<TXVideoEditorViewController>
-TXVideoEditorViewController::initWithBundleIdentifier_URL_applicationName(const QString& bundleIdentifier,
-                                                                          const QUrl& url,
-                                                                          const QString& applicationName)
-{
-    return initWithBundleIdentifier_URL_applicationName_overrideTintColor(bundleIdentifier, url, applicationName,
-                                                                          QColor());
+TXVideoEditorViewController::initWithBundleIdentifier_URL_applicationName(
+    const QString& bundleIdentifier, const QUrl& url, const QString& applicationName) {
+    return initWithBundleIdentifier_URL_applicationName_overrideTintColor(
+        bundleIdentifier, url, applicationName, QColor());
 }
 
-std::shared_ptr<TXVideoEditorViewController> TXVideoEditorViewController::self()
-{
+std::shared_ptr<TXVideoEditorViewController> TXVideoEditorViewController::self() {
     return std::static_pointer_cast<TXVideoEditorViewController>(shared_from_this());
 }
 
-std::weak_ptr<TXVideoEditorViewController> TXVideoEditorViewController::weakSelf()
-{
+std::weak_ptr<TXVideoEditorViewController> TXVideoEditorViewController::weakSelf() {
     return self();
 }
 
-void TXVideoEditorViewController::loadView()
-{
+void TXVideoEditorViewController::loadView() {
     // The editor fills whatever holds it, starting at the main screen's size.
     auto* root = new View(Screen::mainScreen().bounds());
     root->setAutoresizingMask(View::FlexibleWidth | View::FlexibleHeight);
@@ -56,8 +50,8 @@ void TXVideoEditorViewController::loadView()
 }
 
 void TXVideoEditorViewController::init(const QString& bundleIdentifier, const QUrl& url,
-                                       const QString& applicationName, const QColor& overrideTintColor)
-{
+                                       const QString& applicationName,
+                                       const QColor& overrideTintColor) {
     // 1. Base state.
     activityTypes = QStringList();
     setHasEdit(false);
@@ -145,16 +139,25 @@ void TXVideoEditorViewController::init(const QString& bundleIdentifier, const QU
         };
     };
     using Kind = ToolbarItem::SystemItem;
-    shareButton = ToolbarItem::systemItem(Kind::Action, action(&TXVideoEditorViewController::shareAction));
-    undoButton = ToolbarItem::systemItem(Kind::Undo, action(&TXVideoEditorViewController::undoAction));
-    pauseButton = ToolbarItem::systemItem(Kind::Pause, action(&TXVideoEditorViewController::pauseAction));
-    playButton = ToolbarItem::systemItem(Kind::Play, action(&TXVideoEditorViewController::playAction));
-    doneButton = ToolbarItem::systemItem(Kind::Done, action(&TXVideoEditorViewController::doneAction));
-    saveButton = ToolbarItem::systemItem(Kind::Save, action(&TXVideoEditorViewController::saveAction));
+    shareButton =
+        ToolbarItem::systemItem(Kind::Action, action(&TXVideoEditorViewController::shareAction));
+    undoButton =
+        ToolbarItem::systemItem(Kind::Undo, action(&TXVideoEditorViewController::undoAction));
+    pauseButton =
+        ToolbarItem::systemItem(Kind::Pause, action(&TXVideoEditorViewController::pauseAction));
+    playButton =
+        ToolbarItem::systemItem(Kind::Play, action(&TXVideoEditorViewController::playAction));
+    doneButton =
+        ToolbarItem::systemItem(Kind::Done, action(&TXVideoEditorViewController::doneAction));
+    saveButton =
+        ToolbarItem::systemItem(Kind::Save, action(&TXVideoEditorViewController::saveAction));
     // Cancel ends the editor exactly as done does, and the trim button saves.
-    cancelButton = ToolbarItem::systemItem(Kind::Cancel, action(&TXVideoEditorViewController::doneAction));
-    cancelTrimButton = ToolbarItem::systemItem(Kind::Cancel, action(&TXVideoEditorViewController::undoAction));
-    trimButton = ToolbarItem::systemItem(Kind::Done, action(&TXVideoEditorViewController::saveAction));
+    cancelButton =
+        ToolbarItem::systemItem(Kind::Cancel, action(&TXVideoEditorViewController::doneAction));
+    cancelTrimButton =
+        ToolbarItem::systemItem(Kind::Cancel, action(&TXVideoEditorViewController::undoAction));
+    trimButton =
+        ToolbarItem::systemItem(Kind::Done, action(&TXVideoEditorViewController::saveAction));
     flexSpace = ToolbarItem::flexibleSpace();
     fixSpace = ToolbarItem::fixedSpace(0.005 * root->frame().width());
 
@@ -187,8 +190,7 @@ void TXVideoEditorViewController::init(const QString& bundleIdentifier, const QU
     chooseLayout();
 }
 
-TXVideoEditorViewController::~TXVideoEditorViewController()
-{
+TXVideoEditorViewController::~TXVideoEditorViewController() {
     if (avPlayer)
         avPlayer->removeTimeObserver(playbackTimeObserver);
     removeStatusObserver();
@@ -196,37 +198,35 @@ TXVideoEditorViewController::~TXVideoEditorViewController()
     FileManager::defaultManager()->_srRemoveFile_completion(trimFilePath, nullptr);
 }
 
-void TXVideoEditorViewController::addPeriodicPlayheadObserver()
-{
+void TXVideoEditorViewController::addPeriodicPlayheadObserver() {
     playbackTimeObserver = avPlayer->addPeriodicTimeObserverForInterval_queue_usingBlock(
         kPlayheadInterval, nullptr, [weak = weakSelf()](MediaTime) {
             auto editor = weak.lock();
             if (!editor || editor->isScrubbing())
                 return;
             const auto& item = editor->avPlayer->currentItem();
-            editor->avTrimmer->setValue(item ? item->currentTime().seconds() : MediaTime::invalid().seconds());
+            editor->avTrimmer->setValue(item ? item->currentTime().seconds()
+                                             : MediaTime::invalid().seconds());
         });
 }
 
-void TXVideoEditorViewController::addStatusObserver()
-{
+void TXVideoEditorViewController::addStatusObserver() {
     statusObserved_ = avPlayer->currentItem();
     if (auto item = statusObserved_.lock())
         item->addObserver_forKeyPath_options_context(this, QStringLiteral("status"), 0, nullptr);
 }
 
-void TXVideoEditorViewController::removeStatusObserver()
-{
+void TXVideoEditorViewController::removeStatusObserver() {
     if (auto item = statusObserved_.lock())
         item->removeObserver_forKeyPath(this, QStringLiteral("status"));
     statusObserved_.reset();
 }
 
-void TXVideoEditorViewController::observeEndOfPlay()
-{
-    NotificationCenter::defaultCenter().addObserver(
-        this, itemDidPlayToEndNotification(), avPlayerItem.get(), [weak = weakSelf()](const Notification& n) {
-            if (auto editor = weak.lock())
-                editor->itemDidFinishPlaying(n);
-        });
+void TXVideoEditorViewController::observeEndOfPlay() {
+    NotificationCenter::defaultCenter().addObserver(this, itemDidPlayToEndNotification(),
+                                                    avPlayerItem.get(),
+                                                    [weak = weakSelf()](const Notification& n) {
+                                                        if (auto editor = weak.lock())
+                                                            editor->itemDidFinishPlaying(n);
+                                                    });
 }

@@ -44,14 +44,14 @@ class TXVideoEditorViewController : public platform::ViewController,
                                     public platform::MovieScrubberDataSource,
                                     public platform::KeyValueObserver {
     Q_OBJECT
-public:
+  public:
     // Builds the complete editor in intro mode. A null URL is accepted (the
     // extension may build an editor before its inputs have arrived).
     static std::shared_ptr<TXVideoEditorViewController>
     initWithBundleIdentifier_URL_applicationName_overrideTintColor(const QString& bundleIdentifier,
-                                                                    const QUrl& url,
-                                                                    const QString& applicationName,
-                                                                    const QColor& overrideTintColor);
+                                                                   const QUrl& url,
+                                                                   const QString& applicationName,
+                                                                   const QColor& overrideTintColor);
     static std::shared_ptr<TXVideoEditorViewController>
     initWithBundleIdentifier_URL_applicationName(const QString& bundleIdentifier, const QUrl& url,
                                                  const QString& applicationName);
@@ -118,7 +118,8 @@ public:
     // Playback (TXVideoEditorViewController_Playback.cpp)
     void reloadAVLayerWithURL(const QUrl& url);
     void observeValueForKeyPath_ofObject_change_context(const QString& keyPath, const void* object,
-                                                        const QVariantMap& change, void* context) override;
+                                                        const QVariantMap& change,
+                                                        void* context) override;
     void itemDidFinishPlaying(const platform::Notification& notification);
     Q_INVOKABLE void playAction();
     Q_INVOKABLE void pauseAction();
@@ -131,19 +132,21 @@ public:
     void movieScrubberDidEndScrubbing_withHandle(platform::MovieScrubber* scrubber,
                                                  platform::MovieScrubberHandle handle) override;
     void movieScrubberDidBeginEditing(platform::MovieScrubber* scrubber) override;
-    void movieScrubber_editingStartValueDidChange(platform::MovieScrubber* scrubber, double value) override;
-    void movieScrubber_editingEndValueDidChange(platform::MovieScrubber* scrubber, double value) override;
+    void movieScrubber_editingStartValueDidChange(platform::MovieScrubber* scrubber,
+                                                  double value) override;
+    void movieScrubber_editingEndValueDidChange(platform::MovieScrubber* scrubber,
+                                                double value) override;
     void movieScrubberDidCancelEditing(platform::MovieScrubber* scrubber) override;
     void editMode();
     void previewMode();
     void undoAction();
     bool canBecomeFirstResponder() const override { return true; }
-    void motionEnded_withEvent(platform::MotionEvent::Subtype motion, const platform::MotionEvent& event) override;
+    void motionEnded_withEvent(platform::MotionEvent::Subtype motion,
+                               const platform::MotionEvent& event) override;
 
     // Thumbnails (TXVideoEditorViewController_Thumbnails.cpp)
-    QList<double> movieScrubber_evenlySpacedTimestamps_startingAt_endingAt(platform::MovieScrubber* scrubber,
-                                                                          int count, double start,
-                                                                          double end) override;
+    QList<double> movieScrubber_evenlySpacedTimestamps_startingAt_endingAt(
+        platform::MovieScrubber* scrubber, int count, double start, double end) override;
     float movieScrubberThumbnailAspectRatio(platform::MovieScrubber* scrubber) override;
     void movieScrubber_requestThumbnailImageForTimestamp(platform::MovieScrubber* scrubber,
                                                          double timestamp) override;
@@ -168,8 +171,8 @@ public:
     void applyPhoneConstraints();
     void applyPadConstraints();
     int currentOrientation();
-    void viewWillTransitionToSize_withTransitionCoordinator(const QSizeF& size,
-                                                           platform::TransitionCoordinator& coordinator) override;
+    void viewWillTransitionToSize_withTransitionCoordinator(
+        const QSizeF& size, platform::TransitionCoordinator& coordinator) override;
     void viewDidLayoutSubviews() override;
     void handleSingleTap(platform::TapRecognizer* recognizer);
     void configureReplayUIHidden();
@@ -179,10 +182,10 @@ public:
     void viewDidAppear(bool animated) override;
     void viewWillDisappear(bool animated) override;
 
-protected:
+  protected:
     void loadView() override;
 
-private:
+  private:
     TXVideoEditorViewController() = default;
     void init(const QString& bundleIdentifier, const QUrl& url, const QString& applicationName,
               const QColor& overrideTintColor);

@@ -6,7 +6,7 @@ class TXVideoEditorViewController;
 
 // Who hears that the user is done with the editor.
 class TXVideoEditorViewControllerDelegate {
-public:
+  public:
     virtual ~TXVideoEditorViewControllerDelegate() = default;
     // Sent on the main thread when done or cancel is pressed, after playback
     // has paused, with the editor's list of completed activity types.

@@ -13,16 +13,15 @@
 
 using namespace platform;
 
-QUrl TXVideoEditorViewController::trimFileURL()
-{
+QUrl TXVideoEditorViewController::trimFileURL() {
     const QString prefix =
         QStringLiteral("%1/%2_").arg(FileManager::defaultManager()->_srTempPath(), applicationName);
     const long seconds = long(QDateTime::currentMSecsSinceEpoch() / 1000);
-    return QUrl::fromLocalFile(QStringLiteral("%1%2%3").arg(prefix, QString::number(seconds), QStringLiteral(".mp4")));
+    return QUrl::fromLocalFile(
+        QStringLiteral("%1%2%3").arg(prefix, QString::number(seconds), QStringLiteral(".mp4")));
 }
 
-void TXVideoEditorViewController::saveAction()
-{
+void TXVideoEditorViewController::saveAction() {
     activityTypes.append(SaveToAlbumActivityType);
     if (isTrimming()) {
         exportTrimVideoSaveToCameraRoll();
@@ -33,21 +32,23 @@ void TXVideoEditorViewController::saveAction()
     PhotoAlbum::sharedAlbum()->performChanges_creationRequestForAssetFromVideoAtFileURL(
         videoURL, [editor = self()](bool success, ErrorPtr error) mutable {
             if (error)
-                logError(QStringLiteral("Error writing video to camera roll: %1").arg(error->code()));
+                logError(
+                    QStringLiteral("Error writing video to camera roll: %1").arg(error->code()));
             MainQueue::async([editor = std::move(editor)] {});
         });
 }
 
-void TXVideoEditorViewController::exportTrimVideoSaveToCameraRoll()
-{
+void TXVideoEditorViewController::exportTrimVideoSaveToCameraRoll() {
     // The previous clip goes first. A new export in the same second reuses
     // its name, so the export starts only once the removal has run; started
     // earlier, a late removal would delete the new clip.
-    FileManager::defaultManager()->_srRemoveFile_completion(trimFilePath, [editor = self()](ErrorPtr) mutable {
-        MainQueue::async([editor = std::move(editor)] { editor->startTrimExport(); });
-    });
+    FileManager::defaultManager()->_srRemoveFile_completion(
+        trimFilePath, [editor = self()](ErrorPtr) mutable {
+            MainQueue::async([editor = std::move(editor)] { editor->startTrimExport(); });
+        });
     setExporting(true);
-    exportSession = ExportSession::exportSessionWithAsset_presetName(avAsset, ExportPresetPassthrough);
+    exportSession =
+        ExportSession::exportSessionWithAsset_presetName(avAsset, ExportPresetPassthrough);
     trimFilePath = trimFileURL();
     exportSession->setOutputURL(trimFilePath);
     exportSession->setOutputFileType(FileTypeMPEG4);
@@ -60,19 +61,21 @@ void TXVideoEditorViewController::exportTrimVideoSaveToCameraRoll()
     exportSession->setTimeRange(MediaTimeRange::make(start, duration));
 }
 
-void TXVideoEditorViewController::startTrimExport()
-{
-    exportSession->exportAsynchronouslyWithCompletionHandler([editor = self(), session = exportSession]() mutable {
+void TXVideoEditorViewController::startTrimExport() {
+    exportSession->exportAsynchronouslyWithCompletionHandler([editor = self(),
+                                                              session = exportSession]() mutable {
         const int status = session->status();
         if (status == int(ExportSessionStatus::Failed)) {
             const ErrorPtr error = session->error();
-            logError(QStringLiteral("TQVideoEditorViewController: Export Trim Video Failed, due to error: %1")
+            logError(QStringLiteral(
+                         "TQVideoEditorViewController: Export Trim Video Failed, due to error: %1")
                          .arg(error ? error->code() : 0));
         } else if (status == int(ExportSessionStatus::Cancelled)) {
             logDefault(QStringLiteral("TQVideoEditorViewController: Export Trim Video Cancelled"));
         } else {
             MainQueue::sync([&editor, &session] {
-                PhotoAlbum::sharedAlbum()->saveVideoAtPathToAlbum(session->outputURL().toLocalFile());
+                PhotoAlbum::sharedAlbum()->saveVideoAtPathToAlbum(
+                    session->outputURL().toLocalFile());
                 editor->setExporting(false);
                 NotificationCenter::defaultCenter().removeObserver(editor.get());
                 editor->reloadAVLayerWithURL(session->outputURL());
@@ -85,8 +88,7 @@ void TXVideoEditorViewController::startTrimExport()
     });
 }
 
-void TXVideoEditorViewController::doneAction()
-{
+void TXVideoEditorViewController::doneAction() {
     avPlayer->pause();
     if (auto receiver = delegate.lock())
         receiver->videoEditor_didFinishWithActivityTypes(this, activityTypes);

@@ -11,8 +11,7 @@
 
 using namespace platform;
 
-void TXVideoEditorViewController::chooseLayout()
-{
+void TXVideoEditorViewController::chooseLayout() {
     if (Device::userInterfaceIdiom() == Device::InterfaceIdiom::Pad)
         applyPadUILayout();
     else if (currentOrientation() == 1)
@@ -21,14 +20,12 @@ void TXVideoEditorViewController::chooseLayout()
         applyPhoneUILayout();
 }
 
-int TXVideoEditorViewController::currentOrientation()
-{
+int TXVideoEditorViewController::currentOrientation() {
     const QRectF bounds = view()->bounds();
     return bounds.width() > bounds.height() ? 1 : 0;
 }
 
-void TXVideoEditorViewController::applyPhoneUILayout()
-{
+void TXVideoEditorViewController::applyPhoneUILayout() {
     const QMarginsF none(0, 0, 0, -0.0);
     playButton->setImageInsets(none);
     pauseButton->setImageInsets(none);
@@ -49,20 +46,21 @@ void TXVideoEditorViewController::applyPhoneUILayout()
     setPadMode(false);
 }
 
-void TXVideoEditorViewController::applyPadUILayout()
-{
+void TXVideoEditorViewController::applyPadUILayout() {
     // Insets are (left, top, right, bottom): the glyphs move down.
     playButton->setImageInsets(QMarginsF(0, 8, 0, -8));
     pauseButton->setImageInsets(QMarginsF(0, 8, 0, -8));
     shareButton->setImageInsets(QMarginsF(0, 5, 0, -5));
 
     if (isTrimming())
-        topToolBar->setItems({cancelTrimButton, flexSpace, titleButton, flexSpace, playButton, fixSpace, trimButton});
+        topToolBar->setItems({cancelTrimButton, flexSpace, titleButton, flexSpace, playButton,
+                              fixSpace, trimButton});
     else if (isIntroMode())
-        topToolBar->setItems({cancelButton, flexSpace, titleButton, flexSpace, shareButton, fixSpace, saveButton});
+        topToolBar->setItems(
+            {cancelButton, flexSpace, titleButton, flexSpace, shareButton, fixSpace, saveButton});
     else
-        topToolBar->setItems({cancelButton, flexSpace, titleButton, flexSpace, playButton, fixSpace, shareButton,
-                              fixSpace, saveButton});
+        topToolBar->setItems({cancelButton, flexSpace, titleButton, flexSpace, playButton, fixSpace,
+                              shareButton, fixSpace, saveButton});
     bottomToolBar->removeFromSuperview();
     applyPadConstraints();
     setPadMode(true);
@@ -70,33 +68,36 @@ void TXVideoEditorViewController::applyPadUILayout()
 
 // Constraints accumulate: each pass adds four more; those naming the bottom
 // bar go with it when the wide layout takes it away.
-void TXVideoEditorViewController::applyPhoneConstraints()
-{
+void TXVideoEditorViewController::applyPhoneConstraints() {
     View* root = view();
     QWidget* container = scrubberContainterView.get();
     root->addConstraints({
-        LayoutConstraint::make(container, LayoutAttribute::Leading, root, LayoutAttribute::Leading, 1.0, 0),
-        LayoutConstraint::make(container, LayoutAttribute::Trailing, root, LayoutAttribute::Trailing, 1.0, 0),
-        LayoutConstraint::make(container, LayoutAttribute::Bottom, bottomToolBar.get(), LayoutAttribute::Top, 1.0, 0),
+        LayoutConstraint::make(container, LayoutAttribute::Leading, root, LayoutAttribute::Leading,
+                               1.0, 0),
+        LayoutConstraint::make(container, LayoutAttribute::Trailing, root,
+                               LayoutAttribute::Trailing, 1.0, 0),
+        LayoutConstraint::make(container, LayoutAttribute::Bottom, bottomToolBar.get(),
+                               LayoutAttribute::Top, 1.0, 0),
         LayoutConstraint::constantSize(container, LayoutAttribute::Height, 38),
     });
 }
 
-void TXVideoEditorViewController::applyPadConstraints()
-{
+void TXVideoEditorViewController::applyPadConstraints() {
     View* root = view();
     QWidget* container = scrubberContainterView.get();
     root->addConstraints({
-        LayoutConstraint::make(container, LayoutAttribute::Leading, root, LayoutAttribute::Leading, 1.0, 0),
-        LayoutConstraint::make(container, LayoutAttribute::Trailing, root, LayoutAttribute::Trailing, 1.0, 0),
-        LayoutConstraint::make(container, LayoutAttribute::Bottom, root, LayoutAttribute::Bottom, 1.0, 0),
+        LayoutConstraint::make(container, LayoutAttribute::Leading, root, LayoutAttribute::Leading,
+                               1.0, 0),
+        LayoutConstraint::make(container, LayoutAttribute::Trailing, root,
+                               LayoutAttribute::Trailing, 1.0, 0),
+        LayoutConstraint::make(container, LayoutAttribute::Bottom, root, LayoutAttribute::Bottom,
+                               1.0, 0),
         LayoutConstraint::constantSize(container, LayoutAttribute::Height, 38),
     });
 }
 
 void TXVideoEditorViewController::viewWillTransitionToSize_withTransitionCoordinator(
-    const QSizeF& size, TransitionCoordinator& coordinator)
-{
+    const QSizeF& size, TransitionCoordinator& coordinator) {
     ViewController::viewWillTransitionToSize_withTransitionCoordinator(size, coordinator);
     coordinator.animateAlongsideTransition_completion(
         [weak = weakSelf()](TransitionCoordinator&) {
@@ -111,28 +112,24 @@ void TXVideoEditorViewController::viewWillTransitionToSize_withTransitionCoordin
         {});
 }
 
-void TXVideoEditorViewController::viewDidLayoutSubviews()
-{
+void TXVideoEditorViewController::viewDidLayoutSubviews() {
     ViewController::viewDidLayoutSubviews();
     const QRectF bounds = view()->bounds();
     avPlayerLayer->setFrame(QRect(0, 0, int(bounds.width()), int(bounds.height())));
 }
 
-void TXVideoEditorViewController::handleSingleTap(TapRecognizer* recognizer)
-{
+void TXVideoEditorViewController::handleSingleTap(TapRecognizer* recognizer) {
     configureReplayUIHidden();
 }
 
-void TXVideoEditorViewController::configureReplayUIHidden()
-{
+void TXVideoEditorViewController::configureReplayUIHidden() {
     if (isUIHidden())
         showUI();
     else
         hideUI();
 }
 
-void TXVideoEditorViewController::showUI()
-{
+void TXVideoEditorViewController::showUI() {
     Animation::animateWithDuration(0.25, [this] {
         ViewAlpha::setAlpha(topToolBar.get(), 1.0);
         ViewAlpha::setAlpha(bottomToolBar.get(), 1.0);
@@ -141,8 +138,7 @@ void TXVideoEditorViewController::showUI()
     setUiHidden(false);
 }
 
-void TXVideoEditorViewController::hideUI()
-{
+void TXVideoEditorViewController::hideUI() {
     Animation::animateWithDuration(0.25, [this] {
         ViewAlpha::setAlpha(topToolBar.get(), 0.0);
         ViewAlpha::setAlpha(bottomToolBar.get(), 0.0);
@@ -151,19 +147,16 @@ void TXVideoEditorViewController::hideUI()
     setUiHidden(true);
 }
 
-void TXVideoEditorViewController::viewWillAppear(bool animated)
-{
+void TXVideoEditorViewController::viewWillAppear(bool animated) {
     becomeFirstResponder();
     ViewController::viewWillAppear(animated);
 }
 
-void TXVideoEditorViewController::viewDidAppear(bool animated)
-{
+void TXVideoEditorViewController::viewDidAppear(bool animated) {
     ViewController::viewDidAppear(animated);
 }
 
-void TXVideoEditorViewController::viewWillDisappear(bool animated)
-{
+void TXVideoEditorViewController::viewWillDisappear(bool animated) {
     resignFirstResponder();
     ViewController::viewWillDisappear(animated);
 }

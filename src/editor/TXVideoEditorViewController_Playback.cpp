@@ -7,8 +7,7 @@
 
 using namespace platform;
 
-void TXVideoEditorViewController::reloadAVLayerWithURL(const QUrl& url)
-{
+void TXVideoEditorViewController::reloadAVLayerWithURL(const QUrl& url) {
     if (isTrimming())
         if (auto scrubberDelegate = avTrimmer->delegate().lock())
             scrubberDelegate->movieScrubberDidCancelEditing(avTrimmer.get());
@@ -25,11 +24,8 @@ void TXVideoEditorViewController::reloadAVLayerWithURL(const QUrl& url)
     addPeriodicPlayheadObserver();
 }
 
-void TXVideoEditorViewController::observeValueForKeyPath_ofObject_change_context(const QString& keyPath,
-                                                                                 const void* object,
-                                                                                 const QVariantMap& change,
-                                                                                 void* context)
-{
+void TXVideoEditorViewController::observeValueForKeyPath_ofObject_change_context(
+    const QString& keyPath, const void* object, const QVariantMap& change, void* context) {
     const auto& item = avPlayer->currentItem();
     if (!item || object != item.get() || keyPath != QLatin1String("status"))
         return;
@@ -44,24 +40,24 @@ void TXVideoEditorViewController::observeValueForKeyPath_ofObject_change_context
     avTrimmer->reloadData();
 }
 
-void TXVideoEditorViewController::itemDidFinishPlaying(const Notification& notification)
-{
+void TXVideoEditorViewController::itemDidFinishPlaying(const Notification& notification) {
     pauseAction();
     if (isUIHidden())
         showUI();
     avPlayer->seekToTime(MediaTime::zero());
 }
 
-void TXVideoEditorViewController::playAction()
-{
+void TXVideoEditorViewController::playAction() {
     if (isTrimming()) {
         const std::int32_t timescale = avPlayer->currentTime().timescale;
         avPlayer->seekToTime(MediaTime::fromSeconds(editStartTime, timescale));
-        const MediaTime end = MediaTime::fromSeconds(editEndTime, avPlayer->currentTime().timescale);
-        timeObserver = avPlayer->addBoundaryTimeObserverForTimes_queue_usingBlock({end}, nullptr, [weak = weakSelf()] {
-            if (auto editor = weak.lock())
-                editor->pauseAction();
-        });
+        const MediaTime end =
+            MediaTime::fromSeconds(editEndTime, avPlayer->currentTime().timescale);
+        timeObserver = avPlayer->addBoundaryTimeObserverForTimes_queue_usingBlock(
+            {end}, nullptr, [weak = weakSelf()] {
+                if (auto editor = weak.lock())
+                    editor->pauseAction();
+            });
         avPlayer->play();
     } else {
         avPlayer->play();
@@ -74,33 +70,31 @@ void TXVideoEditorViewController::playAction()
     }
     if (isPadMode()) {
         if (isTrimming())
-            topToolBar->setItems({cancelTrimButton, flexSpace, titleButton, flexSpace, pauseButton, fixSpace,
-                                  shareButton, fixSpace, trimButton});
+            topToolBar->setItems({cancelTrimButton, flexSpace, titleButton, flexSpace, pauseButton,
+                                  fixSpace, shareButton, fixSpace, trimButton});
         else
-            topToolBar->setItems({cancelButton, flexSpace, titleButton, flexSpace, pauseButton, fixSpace,
-                                  shareButton, fixSpace, saveButton});
+            topToolBar->setItems({cancelButton, flexSpace, titleButton, flexSpace, pauseButton,
+                                  fixSpace, shareButton, fixSpace, saveButton});
     } else {
         bottomToolBar->setItems({shareButton, flexSpace, pauseButton, flexSpace});
     }
 }
 
-void TXVideoEditorViewController::pauseAction()
-{
+void TXVideoEditorViewController::pauseAction() {
     avPlayer->pause();
     if (isPadMode()) {
         if (isTrimming())
-            topToolBar->setItems({cancelTrimButton, flexSpace, titleButton, flexSpace, playButton, fixSpace,
-                                  shareButton, fixSpace, trimButton});
+            topToolBar->setItems({cancelTrimButton, flexSpace, titleButton, flexSpace, playButton,
+                                  fixSpace, shareButton, fixSpace, trimButton});
         else
-            topToolBar->setItems({cancelButton, flexSpace, titleButton, flexSpace, playButton, fixSpace,
-                                  shareButton, fixSpace, saveButton});
+            topToolBar->setItems({cancelButton, flexSpace, titleButton, flexSpace, playButton,
+                                  fixSpace, shareButton, fixSpace, saveButton});
     } else {
         bottomToolBar->setItems({shareButton, flexSpace, playButton, flexSpace});
     }
 }
 
-void TXVideoEditorViewController::refreshAVRotation()
-{
+void TXVideoEditorViewController::refreshAVRotation() {
     const QRectF bounds = view()->bounds();
     avPlayerLayer->setFrame(bounds.toRect());
     topToolBar->setFrame(QRectF(0, 0, bounds.width(), 60.0));

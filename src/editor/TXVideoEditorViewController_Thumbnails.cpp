@@ -11,8 +11,7 @@
 using namespace platform;
 
 QList<double> TXVideoEditorViewController::movieScrubber_evenlySpacedTimestamps_startingAt_endingAt(
-    MovieScrubber* scrubber, int count, double start, double end)
-{
+    MovieScrubber* scrubber, int count, double start, double end) {
     if (end == 0.0)
         return {0.0};
     QList<double> stamps;
@@ -33,8 +32,7 @@ QList<double> TXVideoEditorViewController::movieScrubber_evenlySpacedTimestamps_
     return stamps;
 }
 
-QSizeF TXVideoEditorViewController::getVideoSize()
-{
+QSizeF TXVideoEditorViewController::getVideoSize() {
     const auto& item = avPlayer->currentItem();
     const QList<AssetTrack> tracks =
         item ? item->asset()->tracksWithMediaType(MediaType::Video) : QList<AssetTrack>();
@@ -43,19 +41,18 @@ QSizeF TXVideoEditorViewController::getVideoSize()
     const float w = float(tracks.first().naturalSize.width());
     const float h = float(tracks.first().naturalSize.height());
     const QTransform& t = tracks.first().preferredTransform;
-    return QSizeF(std::fabs(w * float(t.m11()) + h * float(t.m21())), std::fabs(w * float(t.m12()) + h * float(t.m22())));
+    return QSizeF(std::fabs(w * float(t.m11()) + h * float(t.m21())),
+                  std::fabs(w * float(t.m12()) + h * float(t.m22())));
 }
 
-float TXVideoEditorViewController::movieScrubberThumbnailAspectRatio(MovieScrubber* scrubber)
-{
+float TXVideoEditorViewController::movieScrubberThumbnailAspectRatio(MovieScrubber* scrubber) {
     const QSizeF size = getVideoSize();
     if (size.width() > 0 && size.height() > 0)
         return float(size.width() / size.height());
     return 1.0f;
 }
 
-QSizeF TXVideoEditorViewController::getThumbnailSize()
-{
+QSizeF TXVideoEditorViewController::getThumbnailSize() {
     const QSizeF videoSize = getVideoSize();
     const float ratio = float(videoSize.width()) / float(videoSize.height());
     const float scale = float(Screen::mainScreen().scale());
@@ -64,8 +61,7 @@ QSizeF TXVideoEditorViewController::getThumbnailSize()
     return QSizeF(std::rint(ratio * 38.0f * scale) * scale, height);
 }
 
-double TXVideoEditorViewController::getPlayerDuration()
-{
+double TXVideoEditorViewController::getPlayerDuration() {
     const auto& item = avPlayer->currentItem();
     if (!item || item->status() != PlayerItem::Status::ReadyToPlay)
         return MediaTime::invalid().seconds();
@@ -75,17 +71,16 @@ double TXVideoEditorViewController::getPlayerDuration()
     return ranges.first().start.seconds() + ranges.first().duration.seconds();
 }
 
-double TXVideoEditorViewController::movieScrubberDuration(MovieScrubber* scrubber)
-{
+double TXVideoEditorViewController::movieScrubberDuration(MovieScrubber* scrubber) {
     return getPlayerDuration();
 }
 
-void TXVideoEditorViewController::movieScrubber_requestThumbnailImageForTimestamp(MovieScrubber* scrubber,
-                                                                                  double timestamp)
-{
+void TXVideoEditorViewController::movieScrubber_requestThumbnailImageForTimestamp(
+    MovieScrubber* scrubber, double timestamp) {
     if (!thumbnailGenerator) {
         const auto& item = avPlayer->currentItem();
-        thumbnailGenerator = ImageGenerator::imageGeneratorWithAsset(item ? item->asset() : avAsset);
+        thumbnailGenerator =
+            ImageGenerator::imageGeneratorWithAsset(item ? item->asset() : avAsset);
         thumbnailGenerator->setMaximumSize(getThumbnailSize());
     }
     if (!cachedTimeStamps)
@@ -96,8 +91,8 @@ void TXVideoEditorViewController::movieScrubber_requestThumbnailImageForTimestam
     }
     const MediaTime time = MediaTime::fromSeconds(timestamp, 600);
     thumbnailGenerator->generateImagesAsynchronouslyForTimes_completionHandler(
-        {time}, [editor = self(), timestamp](MediaTime, QImage image, MediaTime, ImageGeneratorResult,
-                                             ErrorPtr error) mutable {
+        {time}, [editor = self(), timestamp](MediaTime, QImage image, MediaTime,
+                                             ImageGeneratorResult, ErrorPtr error) mutable {
             // The editor is a view controller: its last reference must go on
             // the main thread, so this one is handed over there.
             if (error) {
@@ -115,10 +110,10 @@ void TXVideoEditorViewController::movieScrubber_requestThumbnailImageForTimestam
         });
 }
 
-void TXVideoEditorViewController::setThumbnailFromCacheWithTimeStamp(double timestamp)
-{
+void TXVideoEditorViewController::setThumbnailFromCacheWithTimeStamp(double timestamp) {
     MainQueue::async([editor = self(), timestamp] {
-        const QImage image = editor->cachedTimeStamps ? editor->cachedTimeStamps->value(timestamp) : QImage();
+        const QImage image =
+            editor->cachedTimeStamps ? editor->cachedTimeStamps->value(timestamp) : QImage();
         editor->avTrimmer->setThumbnailImage_forTimestamp(image, timestamp);
     });
 }

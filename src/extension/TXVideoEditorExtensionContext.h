@@ -8,8 +8,9 @@
 // The extension context of an editor request: the host's input items and the
 // channel back to the host. Made by the extension entry; used on the main
 // thread.
-class TXVideoEditorExtensionContext : public platform::ExtensionContext, public TXVideoEditorExtensionProtocol {
-public:
+class TXVideoEditorExtensionContext : public platform::ExtensionContext,
+                                      public TXVideoEditorExtensionProtocol {
+  public:
     using platform::ExtensionContext::ExtensionContext;
 
     static platform::InterfaceDescription _extensionAuxiliaryVendorProtocol();

@@ -25,60 +25,59 @@ struct InputSlots {
 
 } // namespace
 
-std::shared_ptr<TXVideoEditorExtensionViewController> TXVideoEditorExtensionViewController::create()
-{
-    return std::shared_ptr<TXVideoEditorExtensionViewController>(new TXVideoEditorExtensionViewController);
+std::shared_ptr<TXVideoEditorExtensionViewController>
+TXVideoEditorExtensionViewController::create() {
+    return std::shared_ptr<TXVideoEditorExtensionViewController>(
+        new TXVideoEditorExtensionViewController);
 }
 
-void TXVideoEditorExtensionViewController::viewDidLoad()
-{
+void TXVideoEditorExtensionViewController::viewDidLoad() {
     ViewController::viewDidLoad();
     setupChildViewControllers();
 }
 
-void TXVideoEditorExtensionViewController::viewWillAppear(bool animated)
-{
+void TXVideoEditorExtensionViewController::viewWillAppear(bool animated) {
     ViewController::viewWillAppear(animated);
     if (!videoEditorViewController)
         setupVideoEditorController();
 }
 
-void TXVideoEditorExtensionViewController::viewDidDisappear(bool animated)
-{
+void TXVideoEditorExtensionViewController::viewDidDisappear(bool animated) {
     ViewController::viewDidDisappear(animated);
     logDefault(QStringLiteral("TXVideoEditorExtensionViewController -viewDidDisappear:"));
     tearDownChildViewControllers();
 }
 
-void TXVideoEditorExtensionViewController::setupChildViewControllers()
-{
+void TXVideoEditorExtensionViewController::setupChildViewControllers() {
     logDefault(QStringLiteral("TXVideoEditorExtensionViewController -setupChildViewControllers"));
     std::weak_ptr<ViewController> weak = shared_from_this();
-    inputItemsFromClientWithCompletionHandler([weak](QString bundleIdentifier, QString appName, QUrl movieURL,
-                                                     QUrl fileAttachmentURL, QString overrideShareMessage,
-                                                     QColor overrideTintColor) {
-        auto controller = std::static_pointer_cast<TXVideoEditorExtensionViewController>(weak.lock());
-        if (!controller)
-            return;
-        // Still on the loading thread; the controller's properties are only
-        // read on the main thread, after the task below is queued.
-        MainQueue::async([controller, bundleIdentifier, appName, movieURL, fileAttachmentURL, overrideShareMessage,
-                          overrideTintColor] {
-            controller->bundleIdentifier = bundleIdentifier;
-            controller->appName = appName;
-            controller->movieURL = movieURL;
-            controller->fileAttachmentURL = fileAttachmentURL;
-            controller->overrideShareMessage = overrideShareMessage;
-            controller->overrideTintColor = overrideTintColor;
-            logDefault(QStringLiteral("loaded input items"));
-            controller->setupVideoEditorController();
+    inputItemsFromClientWithCompletionHandler(
+        [weak](QString bundleIdentifier, QString appName, QUrl movieURL, QUrl fileAttachmentURL,
+               QString overrideShareMessage, QColor overrideTintColor) {
+            auto controller =
+                std::static_pointer_cast<TXVideoEditorExtensionViewController>(weak.lock());
+            if (!controller)
+                return;
+            // Still on the loading thread; the controller's properties are only
+            // read on the main thread, after the task below is queued.
+            MainQueue::async([controller, bundleIdentifier, appName, movieURL, fileAttachmentURL,
+                              overrideShareMessage, overrideTintColor] {
+                controller->bundleIdentifier = bundleIdentifier;
+                controller->appName = appName;
+                controller->movieURL = movieURL;
+                controller->fileAttachmentURL = fileAttachmentURL;
+                controller->overrideShareMessage = overrideShareMessage;
+                controller->overrideTintColor = overrideTintColor;
+                logDefault(QStringLiteral("loaded input items"));
+                controller->setupVideoEditorController();
+            });
         });
-    });
 }
 
-void TXVideoEditorExtensionViewController::inputItemsFromClientWithCompletionHandler(InputHandler handler)
-{
-    logDefault(QStringLiteral("TXVideoEditorExtensionViewController -inputItemsFromClientWithCompletionHandler:"));
+void TXVideoEditorExtensionViewController::inputItemsFromClientWithCompletionHandler(
+    InputHandler handler) {
+    logDefault(QStringLiteral(
+        "TXVideoEditorExtensionViewController -inputItemsFromClientWithCompletionHandler:"));
     auto inputs = std::make_shared<InputSlots>();
     const auto context = extensionContext.lock();
     if (!context)
@@ -92,7 +91,8 @@ void TXVideoEditorExtensionViewController::inputItemsFromClientWithCompletionHan
             continue;
         const QString title = item.attributedTitle;
         provider->loadItemForTypeIdentifier_options_completionHandler(
-            ItemProvider::GenericDataTypeIdentifier, {}, [inputs, title, handler](QVariant value, ErrorPtr error) {
+            ItemProvider::GenericDataTypeIdentifier, {},
+            [inputs, title, handler](QVariant value, ErrorPtr error) {
                 if (error) {
                     logError(QStringLiteral("Error loading input item for type"));
                     return;
@@ -110,20 +110,22 @@ void TXVideoEditorExtensionViewController::inputItemsFromClientWithCompletionHan
                     inputs->shareMessage = value.toString();
                 else if (title == TXVideoEditorExtensionOverrideTintColorKey)
                     inputs->tintColor = value.value<QColor>();
-                if (inputs->appName.isEmpty() || inputs->movieURL.isEmpty() || inputs->bundleIdentifier.isEmpty())
+                if (inputs->appName.isEmpty() || inputs->movieURL.isEmpty() ||
+                    inputs->bundleIdentifier.isEmpty())
                     return;
-                const auto args = std::make_tuple(inputs->bundleIdentifier, inputs->appName, inputs->movieURL,
-                                                  inputs->fileAttachmentURL, inputs->shareMessage, inputs->tintColor);
+                const auto args = std::make_tuple(inputs->bundleIdentifier, inputs->appName,
+                                                  inputs->movieURL, inputs->fileAttachmentURL,
+                                                  inputs->shareMessage, inputs->tintColor);
                 lock.unlock();
                 std::apply(handler, args);
             });
     }
 }
 
-void TXVideoEditorExtensionViewController::setupVideoEditorController()
-{
-    videoEditorViewController = TXVideoEditorViewController::initWithBundleIdentifier_URL_applicationName_overrideTintColor(
-        bundleIdentifier, movieURL, appName, overrideTintColor);
+void TXVideoEditorExtensionViewController::setupVideoEditorController() {
+    videoEditorViewController =
+        TXVideoEditorViewController::initWithBundleIdentifier_URL_applicationName_overrideTintColor(
+            bundleIdentifier, movieURL, appName, overrideTintColor);
     videoEditorViewController->fileAttachmentURL = fileAttachmentURL;
     videoEditorViewController->overrideShareMessage = overrideShareMessage;
     videoEditorViewController->delegate =
@@ -133,8 +135,7 @@ void TXVideoEditorExtensionViewController::setupVideoEditorController()
     videoEditorViewController->didMoveToParentViewController(this);
 }
 
-void TXVideoEditorExtensionViewController::tearDownChildViewControllers()
-{
+void TXVideoEditorExtensionViewController::tearDownChildViewControllers() {
     if (!videoEditorViewController)
         return;
     videoEditorViewController->willMoveToParentViewController(nullptr);
@@ -143,10 +144,10 @@ void TXVideoEditorExtensionViewController::tearDownChildViewControllers()
     videoEditorViewController.reset();
 }
 
-void TXVideoEditorExtensionViewController::videoEditor_didFinishWithActivityTypes(TXVideoEditorViewController* editor,
-                                                                                   const QStringList& activityTypes)
-{
-    logDefault(QStringLiteral("TXVideoEditorExtensionViewController -videoEditorViewDidFinishWithActivityTypes:"));
+void TXVideoEditorExtensionViewController::videoEditor_didFinishWithActivityTypes(
+    TXVideoEditorViewController* editor, const QStringList& activityTypes) {
+    logDefault(QStringLiteral(
+        "TXVideoEditorExtensionViewController -videoEditorViewDidFinishWithActivityTypes:"));
     if (auto context = extensionContext.lock())
         context->extensionObjectProxy()->extensionDidFinishWithActivityTypes(activityTypes);
 }

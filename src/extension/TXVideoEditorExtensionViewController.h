@@ -16,10 +16,10 @@
 class TXVideoEditorExtensionViewController : public platform::ViewController,
                                              public TXVideoEditorViewControllerDelegate {
     Q_OBJECT
-public:
-    using InputHandler = std::function<void(QString bundleIdentifier, QString appName, QUrl movieURL,
-                                            QUrl fileAttachmentURL, QString overrideShareMessage,
-                                            QColor overrideTintColor)>;
+  public:
+    using InputHandler = std::function<void(
+        QString bundleIdentifier, QString appName, QUrl movieURL, QUrl fileAttachmentURL,
+        QString overrideShareMessage, QColor overrideTintColor)>;
 
     static std::shared_ptr<TXVideoEditorExtensionViewController> create();
 
@@ -46,14 +46,14 @@ public:
     void videoEditor_didFinishWithActivityTypes(TXVideoEditorViewController* editor,
                                                 const QStringList& activityTypes) override;
 
-private:
+  private:
     TXVideoEditorExtensionViewController() = default;
 };
 
 // A view whose only behaviour is that it can become the first responder.
 class TXVideoEditorExtensionViewControllerFocusView : public platform::View {
     Q_OBJECT
-public:
+  public:
     using platform::View::View;
     bool canBecomeFirstResponder() const { return true; }
 };

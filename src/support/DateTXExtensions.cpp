@@ -5,8 +5,7 @@
 
 namespace DateTXExtensions {
 
-QString _srGetStringFromDate(const QDateTime& date)
-{
+QString _srGetStringFromDate(const QDateTime& date) {
     // The zone named "..." does not exist, so the lookup yields nothing and
     // the text stays in the device's own zone: the recording's local time.
     QDateTime local = date.toLocalTime();

@@ -25,7 +25,7 @@ extern const std::uint64_t TXScreenRecorderRequiredFreeSpace;
 // file manager and its arguments alive until it ends, and calls its completion
 // (if any) on the worker thread that ran it, never on the main thread.
 class FileManager : public std::enable_shared_from_this<FileManager> {
-public:
+  public:
     using Completion = std::function<void(platform::ErrorPtr error)>;
     using Clock = std::function<QDateTime()>;
 
@@ -62,7 +62,8 @@ public:
 
     // Moves `from` onto `to` (replacing what is there) on the default-priority
     // queue. The completion gets null on success, else the move's error.
-    void _srMoveFileFromURL_toURL_completion(const QUrl& from, const QUrl& to, Completion completion);
+    void _srMoveFileFromURL_toURL_completion(const QUrl& from, const QUrl& to,
+                                             Completion completion);
 
     // Removes the entries whose names begin with `prefix`, ignoring case and
     // diacritics, on the default-priority queue.
@@ -78,7 +79,7 @@ public:
     // unsigned 32-bit number (so modulo 2^32); 0 when it cannot be read.
     std::uint64_t _srDeviceFreeDiskSpace();
 
-private:
+  private:
     FileManager(std::shared_ptr<platform::FileSystem> fileSystem, Clock clock);
 
     std::shared_ptr<platform::FileSystem> fileSystem_;

@@ -2,8 +2,7 @@
 
 #include <array>
 
-std::shared_ptr<platform::Bundle> TXQuillonFrameworkBundle()
-{
+std::shared_ptr<platform::Bundle> TXQuillonFrameworkBundle() {
     // A plain cache: two threads racing on first use both find the same
     // bundle, which is harmless.
     static std::shared_ptr<platform::Bundle> bundle;
@@ -12,8 +11,7 @@ std::shared_ptr<platform::Bundle> TXQuillonFrameworkBundle()
     return bundle;
 }
 
-QString TXLocalizedFrameworkString(const QString& key)
-{
+QString TXLocalizedFrameworkString(const QString& key) {
     const auto bundle = TXQuillonFrameworkBundle();
     if (!bundle)
         return key;

@@ -4,8 +4,7 @@ namespace {
 
 // Decomposes, drops the combining marks and folds case, so that "Á", "á" and
 // "a" all become "a".
-QString folded(const QString& text)
-{
+QString folded(const QString& text) {
     const QString decomposed = text.normalized(QString::NormalizationForm_KD);
     QString out;
     out.reserve(decomposed.size());
@@ -20,7 +19,6 @@ QString folded(const QString& text)
 
 } // namespace
 
-bool beginsWithIgnoringCaseAndDiacritics(const QString& name, const QString& prefix)
-{
+bool beginsWithIgnoringCaseAndDiacritics(const QString& name, const QString& prefix) {
     return folded(name).startsWith(folded(prefix));
 }

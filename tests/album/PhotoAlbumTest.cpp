@@ -1,9 +1,9 @@
 // The photo album on real files: generated movies in, unique names out, and
 // nothing partial or overwritten whatever goes wrong.
 
+#include "platform/services/album/PhotoAlbum.h"
 #include "MediaGenerator.h"
 #include "platform/runtime/GlobalQueue.h"
-#include "platform/services/album/PhotoAlbum.h"
 #include "support/Wait.h"
 
 #include <QCryptographicHash>
@@ -19,30 +19,28 @@ using testing_support::waitUntil;
 
 namespace {
 
-QByteArray hashOf(const QString& path)
-{
+QByteArray hashOf(const QString& path) {
     QFile file(path);
     if (!file.open(QIODevice::ReadOnly))
         return {};
     return QCryptographicHash::hash(file.readAll(), QCryptographicHash::Sha256);
 }
 
-QStringList entries(const QString& folder)
-{
+QStringList entries(const QString& folder) {
     QStringList names = QDir(folder).entryList(QDir::Files | QDir::Hidden | QDir::NoDotAndDotDot);
     names.sort();
     return names;
 }
 
 class PhotoAlbumTest : public ::testing::Test {
-protected:
-    static void SetUpTestSuite()
-    {
+  protected:
+    static void SetUpTestSuite() {
         source = new QTemporaryDir;
         testmedia::MovieSpec movieSpec;
         movieSpec.seconds = 1;
         QString error;
-        ASSERT_TRUE(testmedia::writeMovie(source->filePath("clip.mp4"), movieSpec, &error)) << error.toStdString();
+        ASSERT_TRUE(testmedia::writeMovie(source->filePath("clip.mp4"), movieSpec, &error))
+            << error.toStdString();
     }
     static void TearDownTestSuite() { delete source; }
 
@@ -57,8 +55,7 @@ QTemporaryDir* PhotoAlbumTest::source = nullptr;
 
 } // namespace
 
-TEST_F(PhotoAlbumTest, CopiesAVideoInUnderAUniqueNameAndNeverOverwrites)
-{
+TEST_F(PhotoAlbumTest, CopiesAVideoInUnderAUniqueNameAndNeverOverwrites) {
     const QByteArray original = hashOf(movie());
     QDir().mkpath(folder);
     QFile taken(folder + "/clip.mp4");
@@ -86,8 +83,7 @@ TEST_F(PhotoAlbumTest, CopiesAVideoInUnderAUniqueNameAndNeverOverwrites)
     EXPECT_EQ(hashOf(movie()), original) << "the source is never touched";
 }
 
-TEST_F(PhotoAlbumTest, RefusesWhatIsNotPlayableVideo)
-{
+TEST_F(PhotoAlbumTest, RefusesWhatIsNotPlayableVideo) {
     QFile text(albumRoot.filePath("notes.mp4"));
     ASSERT_TRUE(text.open(QIODevice::WriteOnly));
     text.write("this is not a movie");
@@ -102,27 +98,25 @@ TEST_F(PhotoAlbumTest, RefusesWhatIsNotPlayableVideo)
     EXPECT_TRUE(entries(folder).isEmpty());
 }
 
-TEST_F(PhotoAlbumTest, AFolderThatCannotBeWrittenFailsCleanly)
-{
+TEST_F(PhotoAlbumTest, AFolderThatCannotBeWrittenFailsCleanly) {
     QFile blocker(albumRoot.filePath("Videos"));
     ASSERT_TRUE(blocker.open(QIODevice::WriteOnly)); // a file where the folder should be
     blocker.close();
 
     std::atomic<bool> done{false};
     ErrorPtr seen;
-    album.performChanges_creationRequestForAssetFromVideoAtFileURL(QUrl::fromLocalFile(movie()),
-                                                                   [&](bool success, ErrorPtr error) {
-                                                                       EXPECT_FALSE(success);
-                                                                       seen = error;
-                                                                       done = true;
-                                                                   });
+    album.performChanges_creationRequestForAssetFromVideoAtFileURL(
+        QUrl::fromLocalFile(movie()), [&](bool success, ErrorPtr error) {
+            EXPECT_FALSE(success);
+            seen = error;
+            done = true;
+        });
     ASSERT_TRUE(waitUntil([&] { return done.load(); }));
     ASSERT_TRUE(seen);
     EXPECT_EQ(seen->code(), PhotoAlbum::NotWritable);
 }
 
-TEST_F(PhotoAlbumTest, AFullDiskLeavesNoPartialFile)
-{
+TEST_F(PhotoAlbumTest, AFullDiskLeavesNoPartialFile) {
     // A file-size limit below the movie's size stands in for a full disk.
     rlimit saved{};
     ASSERT_EQ(getrlimit(RLIMIT_FSIZE, &saved), 0);
@@ -139,8 +133,7 @@ TEST_F(PhotoAlbumTest, AFullDiskLeavesNoPartialFile)
     EXPECT_TRUE(entries(folder).isEmpty()) << entries(folder).join(", ").toStdString();
 }
 
-TEST_F(PhotoAlbumTest, FireAndForgetSavesFinishBeforeTheQueuesDrain)
-{
+TEST_F(PhotoAlbumTest, FireAndForgetSavesFinishBeforeTheQueuesDrain) {
     album.saveVideoAtPathToAlbum(movie());
     GlobalQueue::drain();
     EXPECT_EQ(entries(folder), QStringList{"clip.mp4"});

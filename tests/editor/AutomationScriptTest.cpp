@@ -4,8 +4,7 @@
 
 using Kind = AutomationCommand::Kind;
 
-TEST(AutomationScript, ReadsEveryCommandWithCommentsQuotesAndDefaults)
-{
+TEST(AutomationScript, ReadsEveryCommandWithCommentsQuotesAndDefaults) {
     QString error;
     const auto script = parseAutomationScript(R"(# a comment
 tap playButton   # and another
@@ -36,10 +35,10 @@ dismiss
     EXPECT_EQ((*script)[9].kind, Kind::Dismiss);
 }
 
-TEST(AutomationScript, RefusesAnythingElseNamingTheLine)
-{
-    const char* bad[] = {"tap", "tap a b", "drag middle 3", "drag end -1", "drag end soon", "wait forever",
-                         "wait log", "wait ready 0", "resize 400", "sleep nan", "dump now", "frobnicate"};
+TEST(AutomationScript, RefusesAnythingElseNamingTheLine) {
+    const char* bad[] = {"tap",           "tap a b",      "drag middle 3", "drag end -1",
+                         "drag end soon", "wait forever", "wait log",      "wait ready 0",
+                         "resize 400",    "sleep nan",    "dump now",      "frobnicate"};
     for (const char* line : bad) {
         QString error;
         EXPECT_FALSE(parseAutomationScript(QString("dump\n") + line, &error)) << line;

@@ -11,8 +11,8 @@
 // A delegate that records the reports it gets.
 struct RecordingEditorDelegate : TXVideoEditorViewControllerDelegate {
     QList<QStringList> reports;
-    void videoEditor_didFinishWithActivityTypes(TXVideoEditorViewController*, const QStringList& types) override
-    {
+    void videoEditor_didFinishWithActivityTypes(TXVideoEditorViewController*,
+                                                const QStringList& types) override {
         reports.append(types);
     }
 };
@@ -20,7 +20,7 @@ struct RecordingEditorDelegate : TXVideoEditorViewControllerDelegate {
 // An editor on a generated recording (ten seconds, 320x240, 30 fps) in a
 // device and an album of its own, with the widgets on the offscreen platform.
 class EditorTest : public ::testing::Test {
-protected:
+  protected:
     static void SetUpTestSuite();
     static void TearDownTestSuite();
     void SetUp() override;

@@ -11,8 +11,7 @@
 
 QTemporaryDir* EndToEnd::dir = nullptr;
 
-void EndToEnd::SetUpTestSuite()
-{
+void EndToEnd::SetUpTestSuite() {
     dir = new QTemporaryDir;
     testmedia::MovieSpec movieSpec;
     movieSpec.seconds = 10;
@@ -21,14 +20,12 @@ void EndToEnd::SetUpTestSuite()
     ASSERT_TRUE(testmedia::writeMovie(recording(), movieSpec, &error)) << error.toStdString();
 }
 
-void EndToEnd::TearDownTestSuite()
-{
+void EndToEnd::TearDownTestSuite() {
     delete dir;
     dir = nullptr;
 }
 
-QByteArray EndToEnd::hashOf(const QString& path)
-{
+QByteArray EndToEnd::hashOf(const QString& path) {
     QFile file(path);
     if (!file.open(QIODevice::ReadOnly))
         return {};
@@ -36,8 +33,7 @@ QByteArray EndToEnd::hashOf(const QString& path)
 }
 
 EndToEnd::Run EndToEnd::edit(const QString& script, const QString& movie, const QStringList& extra,
-                             const QProcessEnvironment& env)
-{
+                             const QProcessEnvironment& env) {
     const QString scriptPath = mobile.filePath("script.txt");
     QFile file(scriptPath);
     if (file.open(QIODevice::WriteOnly))
@@ -55,11 +51,16 @@ EndToEnd::Run EndToEnd::edit(const QString& script, const QString& movie, const 
         environment.insert(key, env.value(key));
     process.setProcessEnvironment(environment);
     process.start(QCoreApplication::applicationDirPath() + "/tamsel-edit",
-                  QStringList{movie.isEmpty() ? recording() : movie, "--app-name", "Racer", "--bundle-id",
-                              "org.example.Racer", "--automation", scriptPath} + extra);
+                  QStringList{movie.isEmpty() ? recording() : movie, "--app-name", "Racer",
+                              "--bundle-id", "org.example.Racer", "--automation", scriptPath} +
+                      extra);
     if (!process.waitForFinished(180000))
         process.kill();
-    Run run{process.exitCode(), process.readAllStandardOutput(), process.readAllStandardError(), {}, {}};
+    Run run{process.exitCode(),
+            process.readAllStandardOutput(),
+            process.readAllStandardError(),
+            {},
+            {}};
     for (const QByteArray& line : run.out.split('\n')) {
         const QJsonDocument json = QJsonDocument::fromJson(line);
         if (json.isObject())
@@ -70,12 +71,11 @@ EndToEnd::Run EndToEnd::edit(const QString& script, const QString& movie, const 
     return run;
 }
 
-QStringList EndToEnd::albumFiles() const
-{
+QStringList EndToEnd::albumFiles() const {
     return QDir(album.path()).entryList(QDir::Files | QDir::Hidden | QDir::NoDotAndDotDot);
 }
 
-QStringList EndToEnd::tempFiles() const
-{
-    return QDir(mobile.filePath("Library/Tamsel")).entryList(QDir::Files | QDir::Hidden | QDir::NoDotAndDotDot);
+QStringList EndToEnd::tempFiles() const {
+    return QDir(mobile.filePath("Library/Tamsel"))
+        .entryList(QDir::Files | QDir::Hidden | QDir::NoDotAndDotDot);
 }

@@ -11,7 +11,7 @@
 // Runs tamsel-edit with an automation script on a generated recording, in a
 // device, an album and a temporary directory of its own.
 class EndToEnd : public ::testing::Test {
-protected:
+  protected:
     struct Run {
         int exitCode = -1;
         QByteArray out, err;

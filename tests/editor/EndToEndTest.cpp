@@ -7,9 +7,9 @@
 #include <QCoreApplication>
 #include <QDir>
 #include <QFile>
-#include <QProcess>
 #include <QImage>
 #include <QJsonArray>
+#include <QProcess>
 #include <QSet>
 #include <QStandardPaths>
 #include <QThread>
@@ -18,8 +18,7 @@
 
 namespace {
 
-QStringList names(const QJsonValue& array)
-{
+QStringList names(const QJsonValue& array) {
     QStringList out;
     for (const QJsonValue& v : array.toArray())
         out.append(v.toString());
@@ -30,8 +29,7 @@ const QString kSaved = QStringLiteral("[\"org.tamsel.activity.SaveToAlbum\"]");
 
 } // namespace
 
-TEST_F(EndToEnd, TheTypicalUse)
-{
+TEST_F(EndToEnd, TheTypicalUse) {
     const QByteArray original = hashOf(recording());
     const Run run = edit(R"(
 wait ready
@@ -81,7 +79,8 @@ tap doneButton
     const QJsonObject saved = run.dumps[4];
     EXPECT_FALSE(saved["exporting"].toBool());
     EXPECT_FALSE(saved["trimming"].toBool()) << "the player switched to the trimmed clip";
-    EXPECT_TRUE(saved["videoURL"].toString().startsWith("/private/var/mobile/Library/Tamsel//Racer_"));
+    EXPECT_TRUE(
+        saved["videoURL"].toString().startsWith("/private/var/mobile/Library/Tamsel//Racer_"));
     EXPECT_TRUE(names(saved["topToolBar"]).contains("doneButton"));
 
     EXPECT_EQ(run.hostReport, kSaved.toUtf8());
@@ -89,29 +88,30 @@ tap doneButton
     EXPECT_TRUE(tempFiles().isEmpty()) << tempFiles().join(", ").toStdString();
 
     ASSERT_EQ(albumFiles().size(), 1);
-    const auto clip = platform::Asset::assetWithURL(QUrl::fromLocalFile(album.filePath(albumFiles().first())));
+    const auto clip =
+        platform::Asset::assetWithURL(QUrl::fromLocalFile(album.filePath(albumFiles().first())));
     ASSERT_TRUE(clip->isPlayable());
     EXPECT_NEAR(clip->duration().seconds(), trimming["editEndTime"].toDouble(), 0.1);
 }
 
-TEST_F(EndToEnd, AnUntrimmedSaveTellsTheHostAndPutsTheRecordingInTheAlbum)
-{
+TEST_F(EndToEnd, AnUntrimmedSaveTellsTheHostAndPutsTheRecordingInTheAlbum) {
     const Run run = edit("wait ready\ntap saveButton\n");
     ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
     EXPECT_EQ(run.hostReport, kSaved.toUtf8());
-    ASSERT_EQ(albumFiles(), QStringList{"recording.mp4"}) << "the album write finishes before the process ends";
+    ASSERT_EQ(albumFiles(), QStringList{"recording.mp4"})
+        << "the album write finishes before the process ends";
     EXPECT_EQ(hashOf(album.filePath("recording.mp4")), hashOf(recording()));
 }
 
-TEST_F(EndToEnd, AFileThatIsNotAMovieStillGetsAnEditorThatEndsCleanly)
-{
+TEST_F(EndToEnd, AFileThatIsNotAMovieStillGetsAnEditorThatEndsCleanly) {
     const QString notAMovie = mobile.filePath("notes.mp4");
     QFile file(notAMovie);
     ASSERT_TRUE(file.open(QIODevice::WriteOnly));
     file.write("plain text, not a movie");
     file.close();
 
-    const Run run = edit("wait log \"loaded input items\"\nsleep 0.5\ndump\ntap cancelButton\n", notAMovie);
+    const Run run =
+        edit("wait log \"loaded input items\"\nsleep 0.5\ndump\ntap cancelButton\n", notAMovie);
     ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
     ASSERT_EQ(run.dumps.size(), 1);
     EXPECT_TRUE(run.dumps[0]["introMode"].toBool());
@@ -119,8 +119,7 @@ TEST_F(EndToEnd, AFileThatIsNotAMovieStillGetsAnEditorThatEndsCleanly)
     EXPECT_TRUE(albumFiles().isEmpty());
 }
 
-TEST_F(EndToEnd, ShakeUndoesATrimAndCancelThenReadsDone)
-{
+TEST_F(EndToEnd, ShakeUndoesATrimAndCancelThenReadsDone) {
     const Run run = edit("wait ready\ndrag start 2\ndump\nshake\ndump\ntap doneButton\n");
     ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
     ASSERT_EQ(run.dumps.size(), 2);
@@ -132,10 +131,10 @@ TEST_F(EndToEnd, ShakeUndoesATrimAndCancelThenReadsDone)
     EXPECT_EQ(run.hostReport, "[]");
 }
 
-TEST_F(EndToEnd, APhoneFollowsTheWindowsShape)
-{
-    const Run run = edit("wait ready\nresize 400 700\nsleep 0.6\ndump\nresize 900 500\nsleep 0.6\ndump\ndismiss\n",
-                         QString(), {"--device", "phone"});
+TEST_F(EndToEnd, APhoneFollowsTheWindowsShape) {
+    const Run run = edit(
+        "wait ready\nresize 400 700\nsleep 0.6\ndump\nresize 900 500\nsleep 0.6\ndump\ndismiss\n",
+        QString(), {"--device", "phone"});
     ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
     ASSERT_EQ(run.dumps.size(), 2);
     EXPECT_FALSE(run.dumps[0]["padMode"].toBool());
@@ -145,8 +144,7 @@ TEST_F(EndToEnd, APhoneFollowsTheWindowsShape)
     EXPECT_EQ(run.hostReport, "[]") << "dismissed with nothing done";
 }
 
-TEST_F(EndToEnd, AFailingCommandSaysWhyAndFails)
-{
+TEST_F(EndToEnd, AFailingCommandSaysWhyAndFails) {
     for (const char* script : {"wait ready\ntap noSuchButton\n", "wait ready\ntap trimButton\n",
                                "wait playing 0.5\n", "frobnicate\n"}) {
         const Run run = edit(script);
@@ -155,8 +153,7 @@ TEST_F(EndToEnd, AFailingCommandSaysWhyAndFails)
     }
 }
 
-TEST_F(EndToEnd, ScreenshotsOfIntroAndEditModeUnderXvfb)
-{
+TEST_F(EndToEnd, ScreenshotsOfIntroAndEditModeUnderXvfb) {
     const QString xvfbRun = QStandardPaths::findExecutable("xvfb-run");
     if (xvfbRun.isEmpty())
         GTEST_SKIP() << "xvfb-run is not installed";
@@ -167,8 +164,9 @@ TEST_F(EndToEnd, ScreenshotsOfIntroAndEditModeUnderXvfb)
     QFile::remove(editing);
 
     // tamsel-edit itself runs inside a fresh X server.
-    const QString script = QString("wait ready\nsleep 0.5\nscreenshot %1\ndrag end 5\nsleep 0.8\nscreenshot %2\n")
-                               .arg(intro, editing);
+    const QString script =
+        QString("wait ready\nsleep 0.5\nscreenshot %1\ndrag end 5\nsleep 0.8\nscreenshot %2\n")
+            .arg(intro, editing);
     QFile file(mobile.filePath("shots.txt"));
     ASSERT_TRUE(file.open(QIODevice::WriteOnly));
     file.write(script.toUtf8());
@@ -180,8 +178,9 @@ TEST_F(EndToEnd, ScreenshotsOfIntroAndEditModeUnderXvfb)
     environment.insert("TAMSEL_ALBUM_DIR", album.path());
     environment.insert("TAMSEL_AUDIO", "null");
     process.setProcessEnvironment(environment);
-    process.start(xvfbRun, {"-a", "-s", "-screen 0 1280x800x24", QCoreApplication::applicationDirPath() + "/tamsel-edit",
-                            recording(), "--app-name", "Racer", "--automation", file.fileName()});
+    process.start(xvfbRun, {"-a", "-s", "-screen 0 1280x800x24",
+                            QCoreApplication::applicationDirPath() + "/tamsel-edit", recording(),
+                            "--app-name", "Racer", "--automation", file.fileName()});
     ASSERT_TRUE(process.waitForFinished(120000));
     ASSERT_EQ(process.exitCode(), 0) << process.readAllStandardError().toStdString();
 
@@ -199,8 +198,7 @@ TEST_F(EndToEnd, ScreenshotsOfIntroAndEditModeUnderXvfb)
 namespace {
 
 // The pid of a child process of `parent`, or 0.
-qint64 childOf(qint64 parent)
-{
+qint64 childOf(qint64 parent) {
     QFile children(QString("/proc/%1/task/%1/children").arg(parent));
     if (!children.open(QIODevice::ReadOnly))
         return 0;
@@ -208,8 +206,7 @@ qint64 childOf(qint64 parent)
 }
 
 // Whether the process is gone (or only a zombie waiting to be reaped).
-bool ended(qint64 pid)
-{
+bool ended(qint64 pid) {
     QFile status(QString("/proc/%1/status").arg(pid));
     if (!status.open(QIODevice::ReadOnly))
         return true;
@@ -218,8 +215,7 @@ bool ended(qint64 pid)
 
 } // namespace
 
-TEST_F(EndToEnd, TheEditorEndsWhenItsHostGoesAway)
-{
+TEST_F(EndToEnd, TheEditorEndsWhenItsHostGoesAway) {
     QFile script(mobile.filePath("idle.txt"));
     ASSERT_TRUE(script.open(QIODevice::WriteOnly));
     script.write("wait ready\nsleep 60\n");
@@ -230,7 +226,8 @@ TEST_F(EndToEnd, TheEditorEndsWhenItsHostGoesAway)
     environment.insert("TAMSEL_AUDIO", "null");
     environment.insert("QT_QPA_PLATFORM", "offscreen");
     host.setProcessEnvironment(environment);
-    host.start(QCoreApplication::applicationDirPath() + "/tamsel-edit", {recording(), "--automation", script.fileName()});
+    host.start(QCoreApplication::applicationDirPath() + "/tamsel-edit",
+               {recording(), "--automation", script.fileName()});
     ASSERT_TRUE(host.waitForStarted());
     qint64 extension = 0;
     for (int i = 0; i < 200 && !extension; ++i) {

@@ -11,36 +11,37 @@ using testing_support::waitUntil;
 
 namespace {
 
-std::shared_ptr<TXVideoEditorExtensionContext> contextOn(int fd)
-{
+std::shared_ptr<TXVideoEditorExtensionContext> contextOn(int fd) {
     auto connection = std::make_shared<platform::AuxiliaryConnection>(
         fd < 0 ? nullptr : std::make_shared<platform::MessageChannel>(fd),
         TXVideoEditorExtensionContext::_extensionAuxiliaryVendorProtocol(),
         TXVideoEditorExtensionContext::_extensionAuxiliaryHostProtocol());
-    return std::make_shared<TXVideoEditorExtensionContext>(QList<platform::ExtensionItem>{}, connection);
+    return std::make_shared<TXVideoEditorExtensionContext>(QList<platform::ExtensionItem>{},
+                                                           connection);
 }
 
 } // namespace
 
-TEST(TXVideoEditorExtensionContext, EachProxyReachesTheHost)
-{
+TEST(TXVideoEditorExtensionContext, EachProxyReachesTheHost) {
     auto [extensionEnd, hostEnd] = platform::makeSocketPair();
     auto context = contextOn(extensionEnd);
     platform::MessageChannel host(hostEnd);
     QList<QCborArray> reports;
-    host.onMessage = [&](const QCborMap& m) { reports.append(m.value("arguments").toArray().at(0).toArray()); };
+    host.onMessage = [&](const QCborMap& m) {
+        reports.append(m.value("arguments").toArray().at(0).toArray());
+    };
 
     testing_support::LogCapture logs;
     context->extensionObjectProxy()->extensionDidFinishWithActivityTypes({});
-    context->extensionObjectProxy()->extensionDidFinishWithActivityTypes({"SaveToAlbumActivityType"});
+    context->extensionObjectProxy()->extensionDidFinishWithActivityTypes(
+        {"SaveToAlbumActivityType"});
     ASSERT_TRUE(waitUntil([&] { return reports.size() == 2; }));
     EXPECT_EQ(reports[0], QCborArray{});
     EXPECT_EQ(reports[1], QCborArray{"SaveToAlbumActivityType"});
     EXPECT_TRUE(logs.texts().isEmpty());
 }
 
-TEST(TXVideoEditorExtensionContext, AnUnreachableHostIsLoggedWithTheErrorCode)
-{
+TEST(TXVideoEditorExtensionContext, AnUnreachableHostIsLoggedWithTheErrorCode) {
     auto [extensionEnd, hostEnd] = platform::makeSocketPair();
     ::close(hostEnd);
     testing_support::LogCapture logs;
@@ -53,9 +54,9 @@ TEST(TXVideoEditorExtensionContext, AnUnreachableHostIsLoggedWithTheErrorCode)
                                 {platform::LogLevel::Error, "error calling extension - 4097"}}));
 }
 
-TEST(TXVideoEditorExtensionContext, DescribesBothSidesOfTheConnection)
-{
-    EXPECT_TRUE(TXVideoEditorExtensionContext::_extensionAuxiliaryVendorProtocol().selectors.isEmpty());
+TEST(TXVideoEditorExtensionContext, DescribesBothSidesOfTheConnection) {
+    EXPECT_TRUE(
+        TXVideoEditorExtensionContext::_extensionAuxiliaryVendorProtocol().selectors.isEmpty());
     EXPECT_EQ(TXVideoEditorExtensionContext::_extensionAuxiliaryHostProtocol().selectors,
               QStringList{"extensionDidFinishWithActivityTypes:"});
     auto context = contextOn(-1);

@@ -1,9 +1,9 @@
 // The principal view controller: the host's input items in, an editor out,
 // and the editor's report back to the host.
 
+#include "MediaGenerator.h"
 #include "extension/TXVideoEditorExtensionKeys.h"
 #include "extension/TXVideoEditorExtensionViewController.h"
-#include "MediaGenerator.h"
 #include "platform/hosting/MessageChannel.h"
 #include "platform/runtime/GlobalQueue.h"
 #include "platform/runtime/MainQueue.h"
@@ -21,15 +21,13 @@ using testing_support::waitUntil;
 
 namespace {
 
-ExtensionItem item(const QString& title, const QVariant& value)
-{
+ExtensionItem item(const QString& title, const QVariant& value) {
     return {title, {ItemProvider::withItem(value)}};
 }
 
 class PrincipalTest : public ::testing::Test {
-protected:
-    static void SetUpTestSuite()
-    {
+  protected:
+    static void SetUpTestSuite() {
         qputenv("TAMSEL_AUDIO", "null");
         media = new QTemporaryDir;
         testmedia::MovieSpec movieSpec;
@@ -39,8 +37,7 @@ protected:
     static void TearDownTestSuite() { delete media; }
     static QString movie() { return media->filePath("rec.mp4"); }
 
-    void TearDown() override
-    {
+    void TearDown() override {
         principal.reset();
         context.reset();
         GlobalQueue::drain();
@@ -48,14 +45,16 @@ protected:
     }
 
     // A request with these items, its host end on `host`.
-    void request(const QList<ExtensionItem>& items)
-    {
+    void request(const QList<ExtensionItem>& items) {
         root.makeLibrary();
         auto [extensionEnd, hostEnd] = makeSocketPair();
         host = std::make_unique<MessageChannel>(hostEnd);
-        host->onMessage = [this](const QCborMap& m) { reports.append(m.value("arguments").toArray().at(0).toArray()); };
+        host->onMessage = [this](const QCborMap& m) {
+            reports.append(m.value("arguments").toArray().at(0).toArray());
+        };
         auto connection = std::make_shared<AuxiliaryConnection>(
-            std::make_shared<MessageChannel>(extensionEnd), TXVideoEditorExtensionContext::_extensionAuxiliaryVendorProtocol(),
+            std::make_shared<MessageChannel>(extensionEnd),
+            TXVideoEditorExtensionContext::_extensionAuxiliaryVendorProtocol(),
             TXVideoEditorExtensionContext::_extensionAuxiliaryHostProtocol());
         context = std::make_shared<TXVideoEditorExtensionContext>(items, connection);
         principal = TXVideoEditorExtensionViewController::create();
@@ -64,10 +63,10 @@ protected:
         principal->view(); // loads: the loads of the items start
     }
 
-    QList<ExtensionItem> required() const
-    {
+    QList<ExtensionItem> required() const {
         return {item(TXVideoEditorExtensionBundleIdentifierKey, "org.example.Racer"),
-                item(TXVideoEditorExtensionAppNameKey, "Racer"), item(TXVideoEditorExtensionMoviePathKey, movie())};
+                item(TXVideoEditorExtensionAppNameKey, "Racer"),
+                item(TXVideoEditorExtensionMoviePathKey, movie())};
     }
 
     static QTemporaryDir* media;
@@ -82,11 +81,12 @@ QTemporaryDir* PrincipalTest::media = nullptr;
 
 } // namespace
 
-TEST_F(PrincipalTest, TheRequiredItemsBuildAnEditorWithEveryValue)
-{
-    request(required() + QList<ExtensionItem>{item(TXVideoEditorExtensionFileAttachmentKey, "/home/me/notes.txt"),
-                                              item(TXVideoEditorExtensionOverrideShareMessageKey, "Look!"),
-                                              item(TXVideoEditorExtensionOverrideTintColorKey, QColor(10, 200, 30))});
+TEST_F(PrincipalTest, TheRequiredItemsBuildAnEditorWithEveryValue) {
+    request(required() +
+            QList<ExtensionItem>{
+                item(TXVideoEditorExtensionFileAttachmentKey, "/home/me/notes.txt"),
+                item(TXVideoEditorExtensionOverrideShareMessageKey, "Look!"),
+                item(TXVideoEditorExtensionOverrideTintColorKey, QColor(10, 200, 30))});
     // Every load after the three required ones builds the editor again, so
     // the last editor has every value.
     ASSERT_TRUE(waitUntil([&] {
@@ -100,30 +100,31 @@ TEST_F(PrincipalTest, TheRequiredItemsBuildAnEditorWithEveryValue)
     EXPECT_EQ(editor->videoURL, QUrl::fromLocalFile(movie()));
     EXPECT_EQ(editor->fileAttachmentURL, QUrl::fromLocalFile("/home/me/notes.txt"));
     EXPECT_EQ(editor->overrideShareMessage, "Look!");
-    EXPECT_EQ(editor->topToolBar->tintColor(), QColor(10, 200, 30)) << "the colour passes through unchanged";
+    EXPECT_EQ(editor->topToolBar->tintColor(), QColor(10, 200, 30))
+        << "the colour passes through unchanged";
     EXPECT_EQ(principal->childViewControllers().size(), logs.count("loaded input items"))
         << "each handler run adds an editor; earlier ones stay beneath";
     EXPECT_EQ(editor->view()->parentWidget(), principal->view());
 }
 
-TEST_F(PrincipalTest, AFailedLoadOrATitleInTheWrongCaseBuildsNothing)
-{
+TEST_F(PrincipalTest, AFailedLoadOrATitleInTheWrongCaseBuildsNothing) {
     QList<ExtensionItem> items = required();
-    items[0] = {TXVideoEditorExtensionBundleIdentifierKey,
-                {std::make_shared<ItemProvider>(QCborMap{{"colour", "red"}},
-                                                QStringList{ItemProvider::GenericDataTypeIdentifier})}};
+    items[0] = {
+        TXVideoEditorExtensionBundleIdentifierKey,
+        {std::make_shared<ItemProvider>(QCborMap{{"colour", "red"}},
+                                        QStringList{ItemProvider::GenericDataTypeIdentifier})}};
     items.append(item(TXVideoEditorExtensionAppNameKey.toLower(), "racer"));
     items.append({TXVideoEditorExtensionBundleIdentifierKey, {}}); // no attachment at all
     request(items);
-    ASSERT_TRUE(waitUntil([&] { return logs.count(LogLevel::Error, "Error loading input item for type") == 1; }));
+    ASSERT_TRUE(waitUntil(
+        [&] { return logs.count(LogLevel::Error, "Error loading input item for type") == 1; }));
     GlobalQueue::drain();
     MainQueue::runPending();
     EXPECT_EQ(logs.count("loaded input items"), 0);
     EXPECT_FALSE(principal->videoEditorViewController);
 }
 
-TEST_F(PrincipalTest, AppearingBuildsOnceAndDisappearingTearsDown)
-{
+TEST_F(PrincipalTest, AppearingBuildsOnceAndDisappearingTearsDown) {
     request({});
     principal->viewWillAppear(false);
     ASSERT_TRUE(principal->videoEditorViewController) << "built with whatever the inputs are: none";
@@ -138,13 +139,16 @@ TEST_F(PrincipalTest, AppearingBuildsOnceAndDisappearingTearsDown)
     EXPECT_EQ(logs.count("TXVideoEditorExtensionViewController -viewDidDisappear:"), 2);
 }
 
-TEST_F(PrincipalTest, TheEditorsReportGoesToTheHostUnchanged)
-{
+TEST_F(PrincipalTest, TheEditorsReportGoesToTheHostUnchanged) {
     request(required());
     ASSERT_TRUE(waitUntil([&] { return bool(principal->videoEditorViewController); }));
-    principal->videoEditorViewController->activityTypes = {"org.tamsel.activity.SaveToAlbum", "TXPublishToYouTube"};
+    principal->videoEditorViewController->activityTypes = {"org.tamsel.activity.SaveToAlbum",
+                                                           "TXPublishToYouTube"};
     principal->videoEditorViewController->doneAction();
     ASSERT_TRUE(waitUntil([&] { return reports.size() == 1; }));
     EXPECT_EQ(reports[0], (QCborArray{"org.tamsel.activity.SaveToAlbum", "TXPublishToYouTube"}));
-    EXPECT_EQ(logs.count("TXVideoEditorExtensionViewController -videoEditorViewDidFinishWithActivityTypes:"), 1);
+    EXPECT_EQ(
+        logs.count(
+            "TXVideoEditorExtensionViewController -videoEditorViewDidFinishWithActivityTypes:"),
+        1);
 }

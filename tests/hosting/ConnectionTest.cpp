@@ -26,8 +26,7 @@ struct Loaded {
     std::atomic<bool> done{false};
     std::atomic<bool> onMain{true};
 
-    ItemProvider::LoadHandler handler()
-    {
+    ItemProvider::LoadHandler handler() {
         return [this](QVariant i, ErrorPtr e) {
             std::lock_guard lock(mutex);
             item = i;
@@ -38,23 +37,26 @@ struct Loaded {
     }
 };
 
-const InterfaceDescription kHost{"TXVideoEditorExtensionHostProtocol", {"extensionDidFinishWithActivityTypes:"}};
+const InterfaceDescription kHost{"TXVideoEditorExtensionHostProtocol",
+                                 {"extensionDidFinishWithActivityTypes:"}};
 
 } // namespace
 
-TEST(ItemProvider, LoadsStringsAndColoursOnAWorkerThread)
-{
-    const QList<QVariant> values{QStringLiteral("/home/me/Videos/rec.mp4"), QColor(255, 128, 0, 255)};
+TEST(ItemProvider, LoadsStringsAndColoursOnAWorkerThread) {
+    const QList<QVariant> values{QStringLiteral("/home/me/Videos/rec.mp4"),
+                                 QColor(255, 128, 0, 255)};
     for (const QVariant& value : values) {
         // Through the wire form, as the extension gets it.
-        const auto items = decodeExtensionItems(encodeExtensionItems({{"KEY", {ItemProvider::withItem(value)}}}));
+        const auto items =
+            decodeExtensionItems(encodeExtensionItems({{"KEY", {ItemProvider::withItem(value)}}}));
         ASSERT_EQ(items.size(), 1);
         EXPECT_EQ(items[0].attributedTitle, "KEY");
         const auto& provider = items[0].attachments.at(0);
-        ASSERT_TRUE(provider->hasItemConformingToTypeIdentifier(ItemProvider::GenericDataTypeIdentifier));
+        ASSERT_TRUE(
+            provider->hasItemConformingToTypeIdentifier(ItemProvider::GenericDataTypeIdentifier));
         Loaded loaded;
-        provider->loadItemForTypeIdentifier_options_completionHandler(ItemProvider::GenericDataTypeIdentifier, {},
-                                                                      loaded.handler());
+        provider->loadItemForTypeIdentifier_options_completionHandler(
+            ItemProvider::GenericDataTypeIdentifier, {}, loaded.handler());
         ASSERT_TRUE(waitUntil([&] { return loaded.done.load(); }));
         EXPECT_FALSE(loaded.error);
         EXPECT_FALSE(loaded.onMain);
@@ -62,37 +64,41 @@ TEST(ItemProvider, LoadsStringsAndColoursOnAWorkerThread)
     }
 }
 
-TEST(ItemProvider, UnreadableOrUntypedItemsFailTheirLoadOnly)
-{
+TEST(ItemProvider, UnreadableOrUntypedItemsFailTheirLoadOnly) {
     struct Case {
         QCborValue wire;
         QStringList types;
         int code;
     };
     const Case cases[] = {
-        {QCborMap{{"colour", QCborArray{2.0, 0, 0, 1}}}, {ItemProvider::GenericDataTypeIdentifier}, ItemProvider::UnreadableItem},
-        {QCborMap{{"colour", "red"}}, {ItemProvider::GenericDataTypeIdentifier}, ItemProvider::UnreadableItem},
+        {QCborMap{{"colour", QCborArray{2.0, 0, 0, 1}}},
+         {ItemProvider::GenericDataTypeIdentifier},
+         ItemProvider::UnreadableItem},
+        {QCborMap{{"colour", "red"}},
+         {ItemProvider::GenericDataTypeIdentifier},
+         ItemProvider::UnreadableItem},
         {QCborValue(42), {ItemProvider::GenericDataTypeIdentifier}, ItemProvider::UnreadableItem},
         {QCborValue("text"), {}, ItemProvider::UnavailableType},
     };
     for (const Case& c : cases) {
         ItemProvider provider(c.wire, c.types);
         Loaded loaded;
-        provider.loadItemForTypeIdentifier_options_completionHandler(ItemProvider::GenericDataTypeIdentifier, {},
-                                                                     loaded.handler());
+        provider.loadItemForTypeIdentifier_options_completionHandler(
+            ItemProvider::GenericDataTypeIdentifier, {}, loaded.handler());
         ASSERT_TRUE(waitUntil([&] { return loaded.done.load(); }));
         ASSERT_TRUE(loaded.error);
         EXPECT_EQ(loaded.error->code(), c.code);
         EXPECT_FALSE(loaded.item.isValid());
     }
-    EXPECT_FALSE(ItemProvider(QCborValue("x"), {}).hasItemConformingToTypeIdentifier(ItemProvider::GenericDataTypeIdentifier));
+    EXPECT_FALSE(ItemProvider(QCborValue("x"), {})
+                     .hasItemConformingToTypeIdentifier(ItemProvider::GenericDataTypeIdentifier));
 }
 
-TEST(ExtensionItem, WireFieldsOfTheWrongTypeReadAsEmpty)
-{
+TEST(ExtensionItem, WireFieldsOfTheWrongTypeReadAsEmpty) {
     const auto items = decodeExtensionItems(QCborArray{
         QCborMap{{"title", 5}, {"attachments", "nope"}},
-        QCborMap{{"title", "T"}, {"attachments", QCborArray{QCborMap{{"types", QCborArray{1, "a/b"}}}}}},
+        QCborMap{{"title", "T"},
+                 {"attachments", QCborArray{QCborMap{{"types", QCborArray{1, "a/b"}}}}}},
         QCborValue("not an item"),
     });
     ASSERT_EQ(items.size(), 3);
@@ -103,11 +109,10 @@ TEST(ExtensionItem, WireFieldsOfTheWrongTypeReadAsEmpty)
     EXPECT_TRUE(decodeExtensionItems(QCborValue("junk")).isEmpty());
 }
 
-TEST(RemoteObjectProxy, EveryProxyOfAConnectionDeliversInOrderEvenAnEmptyList)
-{
+TEST(RemoteObjectProxy, EveryProxyOfAConnectionDeliversInOrderEvenAnEmptyList) {
     auto [a, b] = makeSocketPair();
-    auto connection = std::make_shared<AuxiliaryConnection>(std::make_shared<MessageChannel>(a),
-                                                            InterfaceDescription{"Vendor", {}}, kHost);
+    auto connection = std::make_shared<AuxiliaryConnection>(
+        std::make_shared<MessageChannel>(a), InterfaceDescription{"Vendor", {}}, kHost);
     MessageChannel host(b);
     QList<QCborMap> received;
     host.onMessage = [&](const QCborMap& m) { received.append(m); };
@@ -127,13 +132,11 @@ TEST(RemoteObjectProxy, EveryProxyOfAConnectionDeliversInOrderEvenAnEmptyList)
               (QCborArray{"SaveToAlbumActivityType", "TXPublishToYouTube"}));
 }
 
-TEST(RemoteObjectProxy, UndeliverableMessagesReachTheErrorHandlerOffTheMainThread)
-{
+TEST(RemoteObjectProxy, UndeliverableMessagesReachTheErrorHandlerOffTheMainThread) {
     struct Seen {
         std::atomic<int> code{0};
         std::atomic<bool> onMain{true};
-        RemoteObjectProxy::ErrorHandler handler()
-        {
+        RemoteObjectProxy::ErrorHandler handler() {
             return [this](ErrorPtr e) {
                 onMain = QThread::currentThread() == QCoreApplication::instance()->thread();
                 code = e->code();
@@ -146,14 +149,16 @@ TEST(RemoteObjectProxy, UndeliverableMessagesReachTheErrorHandlerOffTheMainThrea
     auto gone = std::make_shared<AuxiliaryConnection>(std::make_shared<MessageChannel>(a),
                                                       InterfaceDescription{}, kHost);
     Seen interrupted;
-    gone->remoteObjectProxyWithErrorHandler(interrupted.handler())->extensionDidFinishWithActivityTypes({"x"});
+    gone->remoteObjectProxyWithErrorHandler(interrupted.handler())
+        ->extensionDidFinishWithActivityTypes({"x"});
     ASSERT_TRUE(waitUntil([&] { return interrupted.code != 0; }));
     EXPECT_EQ(interrupted.code, RemoteObjectProxy::ConnectionInterrupted);
     EXPECT_FALSE(interrupted.onMain);
 
     auto none = std::make_shared<AuxiliaryConnection>(nullptr, InterfaceDescription{}, kHost);
     Seen invalid;
-    none->remoteObjectProxyWithErrorHandler(invalid.handler())->extensionDidFinishWithActivityTypes({});
+    none->remoteObjectProxyWithErrorHandler(invalid.handler())
+        ->extensionDidFinishWithActivityTypes({});
     ASSERT_TRUE(waitUntil([&] { return invalid.code != 0; }));
     EXPECT_EQ(invalid.code, RemoteObjectProxy::ConnectionInvalid);
 

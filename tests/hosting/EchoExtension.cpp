@@ -8,8 +8,7 @@
 #include <QCoreApplication>
 #include <cstdlib>
 
-int main(int argc, char** argv)
-{
+int main(int argc, char** argv) {
     QCoreApplication app(argc, argv);
     auto endpoint = platform::ExtensionEndpoint::fromEnvironment();
     if (!endpoint->hasHost())
@@ -24,7 +23,8 @@ int main(int argc, char** argv)
         QStringList titles;
         for (const auto& item : items)
             titles.append(item.attributedTitle);
-        connection->remoteObjectProxyWithErrorHandler(nullptr)->extensionDidFinishWithActivityTypes(titles);
+        connection->remoteObjectProxyWithErrorHandler(nullptr)->extensionDidFinishWithActivityTypes(
+            titles);
     };
     endpoint->onDismiss = [&] { app.exit(0); };
     endpoint->onHostGone = [&] { app.exit(7); };

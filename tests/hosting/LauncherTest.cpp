@@ -12,8 +12,7 @@ using testing_support::waitUntil;
 
 namespace {
 
-QString echoExtension()
-{
+QString echoExtension() {
     return QCoreApplication::applicationDirPath() + "/tamsel_echo_extension";
 }
 
@@ -22,17 +21,17 @@ struct LauncherRun {
     QList<QStringList> reports;
     std::optional<std::pair<int, bool>> ended;
 
-    LauncherRun()
-    {
+    LauncherRun() {
         QObject::connect(&launcher, &ExtensionLauncher::extensionDidFinishWithActivityTypes,
                          [this](const QStringList& types) { reports.append(types); });
         QObject::connect(&launcher, &ExtensionLauncher::extensionEnded,
-                         [this](int code, bool crashed) { ended = {code, crashed}; });
+                         [this](int code, bool crashed) {
+                             ended = {code, crashed};
+                         });
     }
 };
 
-QList<ExtensionItem> items(const QStringList& titles)
-{
+QList<ExtensionItem> items(const QStringList& titles) {
     QList<ExtensionItem> out;
     for (const QString& title : titles)
         out.append({title, {ItemProvider::withItem(QStringLiteral("value"))}});
@@ -41,11 +40,11 @@ QList<ExtensionItem> items(const QStringList& titles)
 
 } // namespace
 
-TEST(ExtensionLauncher, SendsTheRequestHearsTheReportAndDismisses)
-{
+TEST(ExtensionLauncher, SendsTheRequestHearsTheReportAndDismisses) {
     LauncherRun run;
     QString error;
-    ASSERT_TRUE(run.launcher.start(echoExtension(), {}, items({"A", "B"}), &error)) << error.toStdString();
+    ASSERT_TRUE(run.launcher.start(echoExtension(), {}, items({"A", "B"}), &error))
+        << error.toStdString();
     ASSERT_TRUE(waitUntil([&] { return !run.reports.isEmpty(); }));
     EXPECT_EQ(run.reports.first(), (QStringList{"A", "B"}));
 
@@ -55,8 +54,7 @@ TEST(ExtensionLauncher, SendsTheRequestHearsTheReportAndDismisses)
     EXPECT_FALSE(run.ended->second);
 }
 
-TEST(ExtensionLauncher, SurvivesAnExtensionThatCrashes)
-{
+TEST(ExtensionLauncher, SurvivesAnExtensionThatCrashes) {
     LauncherRun run;
     ASSERT_TRUE(run.launcher.start(echoExtension(), {"--crash"}, items({"A"})));
     ASSERT_TRUE(waitUntil([&] { return run.ended.has_value(); }));
@@ -64,8 +62,7 @@ TEST(ExtensionLauncher, SurvivesAnExtensionThatCrashes)
     EXPECT_TRUE(run.reports.isEmpty());
 }
 
-TEST(ExtensionLauncher, ReportsAProgramThatCannotStart)
-{
+TEST(ExtensionLauncher, ReportsAProgramThatCannotStart) {
     LauncherRun run;
     QString error;
     EXPECT_FALSE(run.launcher.start("/nonexistent/extension", {}, {}, &error));

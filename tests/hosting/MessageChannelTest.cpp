@@ -16,8 +16,7 @@ using testing_support::waitUntil;
 namespace {
 
 struct Pair {
-    Pair()
-    {
+    Pair() {
         auto [a, b] = makeSocketPair();
         left = std::make_unique<MessageChannel>(a);
         right = std::make_unique<MessageChannel>(b);
@@ -31,14 +30,14 @@ struct Pair {
 
 } // namespace
 
-TEST(MessageChannel, DeliversWholeMessagesInOrderWhateverTheirSize)
-{
+TEST(MessageChannel, DeliversWholeMessagesInOrderWhateverTheirSize) {
     Pair pair;
     const QByteArray big(3 * 1024 * 1024, 'z'); // more than the socket buffers hold
     // Sending blocks until the reader drains, and the reader is this thread.
     std::atomic<bool> sent{false};
     GlobalQueue::async(QueuePriority::Default, [&] {
-        sent = !pair.left->send(QCborMap{{"n", 1}}) && !pair.left->send(QCborMap{{"n", 2}, {"blob", big}}) &&
+        sent = !pair.left->send(QCborMap{{"n", 1}}) &&
+               !pair.left->send(QCborMap{{"n", 2}, {"blob", big}}) &&
                !pair.left->send(QCborMap{{"n", 3}});
     });
     ASSERT_TRUE(waitUntil([&] { return pair.received.size() == 3; }));
@@ -49,8 +48,7 @@ TEST(MessageChannel, DeliversWholeMessagesInOrderWhateverTheirSize)
     EXPECT_EQ(pair.closings, 0);
 }
 
-TEST(MessageChannel, PeerGoneClosesOnceAndSendingFailsWithoutASignal)
-{
+TEST(MessageChannel, PeerGoneClosesOnceAndSendingFailsWithoutASignal) {
     Pair pair;
     pair.left.reset();
     ASSERT_TRUE(waitUntil([&] { return pair.closings == 1; }));
@@ -61,12 +59,11 @@ TEST(MessageChannel, PeerGoneClosesOnceAndSendingFailsWithoutASignal)
     EXPECT_EQ(pair.closings, 1);
 }
 
-TEST(MessageChannel, GarbageFromThePeerClosesTheChannel)
-{
+TEST(MessageChannel, GarbageFromThePeerClosesTheChannel) {
     const QList<QByteArray> garbage = {
-        QByteArray("\x7f\xff\xff\xff", 4) + "x",                  // absurd length
+        QByteArray("\x7f\xff\xff\xff", 4) + "x",                           // absurd length
         QByteArray("\x00\x00\x00\x03", 4) + QByteArray("\xff\xff\xff", 3), // not CBOR
-        QByteArray("\x00\x00\x00\x01", 4) + QByteArray("\x05", 1),  // CBOR, but not a map
+        QByteArray("\x00\x00\x00\x01", 4) + QByteArray("\x05", 1),         // CBOR, but not a map
     };
     for (const QByteArray& bytes : garbage) {
         auto [a, b] = makeSocketPair();

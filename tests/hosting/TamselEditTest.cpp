@@ -14,8 +14,7 @@ struct Result {
     QByteArray out, err;
 };
 
-Result tamselEdit(const QStringList& arguments, const QProcessEnvironment& extra = {})
-{
+Result tamselEdit(const QStringList& arguments, const QProcessEnvironment& extra = {}) {
     QProcess process;
     QProcessEnvironment env = QProcessEnvironment::systemEnvironment();
     for (const QString& key : extra.keys())
@@ -27,27 +26,25 @@ Result tamselEdit(const QStringList& arguments, const QProcessEnvironment& extra
     return {process.exitCode(), process.readAllStandardOutput(), process.readAllStandardError()};
 }
 
-QString echo()
-{
+QString echo() {
     return QCoreApplication::applicationDirPath() + "/tamsel_echo_extension";
 }
 
 } // namespace
 
-TEST(TamselEdit, SendsTheInputItemsAndPrintsWhatTheExtensionReports)
-{
-    const Result r = tamselEdit({"--extension", echo(), "rec.mp4", "--app-name", "Racer", "--tint-color", "#ff8800",
-                                 "--share-message", ""});
+TEST(TamselEdit, SendsTheInputItemsAndPrintsWhatTheExtensionReports) {
+    const Result r = tamselEdit({"--extension", echo(), "rec.mp4", "--app-name", "Racer",
+                                 "--tint-color", "#ff8800", "--share-message", ""});
     EXPECT_EQ(r.exitCode, 0) << r.err.toStdString();
     // The echo extension reports the titles of the items it was sent.
     EXPECT_EQ(QJsonDocument::fromJson(r.out).array(),
               QJsonArray({"TXVideoEditorExtensionMovieURLKey", "TXVideoEditorExtensionAppNameKey",
-                          "TXVideoEditorExtensionBundleIdentifierKey", "TXVideoEditorExtensionOverrideShareMessageKey",
+                          "TXVideoEditorExtensionBundleIdentifierKey",
+                          "TXVideoEditorExtensionOverrideShareMessageKey",
                           "TXVideoEditorExtensionOverrideTintColorKey"}));
 }
 
-TEST(TamselEdit, SurvivesAnExtensionThatCrashes)
-{
+TEST(TamselEdit, SurvivesAnExtensionThatCrashes) {
     QProcessEnvironment env;
     env.insert("TAMSEL_ECHO_CRASH", "1");
     const Result r = tamselEdit({"--extension", echo()}, env);
@@ -56,19 +53,17 @@ TEST(TamselEdit, SurvivesAnExtensionThatCrashes)
     EXPECT_TRUE(r.err.contains("the editor ended abnormally")) << r.err.toStdString();
 }
 
-TEST(TamselEdit, RefusesNonsenseArguments)
-{
-    for (const QStringList& args : {QStringList{"--tint-color", "not-a-colour"}, QStringList{"--frobnicate"},
-                                    QStringList{"a.mp4", "b.mp4"}, QStringList{"--device", "watch"},
-                                    QStringList{"--app-name"}}) {
+TEST(TamselEdit, RefusesNonsenseArguments) {
+    for (const QStringList& args : {QStringList{"--tint-color", "not-a-colour"},
+                                    QStringList{"--frobnicate"}, QStringList{"a.mp4", "b.mp4"},
+                                    QStringList{"--device", "watch"}, QStringList{"--app-name"}}) {
         const Result r = tamselEdit(args);
         EXPECT_EQ(r.exitCode, 2) << args.join(' ').toStdString();
         EXPECT_TRUE(r.err.contains("usage: tamsel-edit")) << args.join(' ').toStdString();
     }
 }
 
-TEST(TamselEdit, AnEditorClosedWithNothingDoneReportsAnEmptyList)
-{
+TEST(TamselEdit, AnEditorClosedWithNothingDoneReportsAnEmptyList) {
     QTemporaryDir mobile;
     QProcessEnvironment env;
     env.insert("TAMSEL_MOBILE_ROOT", mobile.path());

@@ -1,8 +1,8 @@
 #include "platform/media/ExportSession.h"
-#include "support/TempDir.h"
 #include "ClipProbe.h"
 #include "MediaFixtures.h"
 #include "platform/media/Asset.h"
+#include "support/TempDir.h"
 
 #include <QDir>
 #include <QFile>
@@ -108,8 +108,8 @@ TEST(ExportSessionPassthrough, StartsBetweenKeyframesAtTheRequestedFrameWithAudi
         testing_support::ScopedEnv env("TAMSEL_EXPORT_REMUX", remux);
         for (const auto& [start, duration] :
              {std::pair{1.5, 2.0}, std::pair{2.0, 1.9}, std::pair{0.0, 2.5}, std::pair{3.8, 0.5}}) {
-            SCOPED_TRACE(testing::Message() << "remux '" << remux << "' start " << start
-                                            << " duration " << duration);
+            SCOPED_TRACE(testing::Message()
+                         << "remux '" << remux << "' start " << start << " duration " << duration);
             const QString output = scratchPath(QStringLiteral("cut.mp4"));
             ExportRun run{makeSession(source, ExportPresetPassthrough, output, start, duration)};
             ASSERT_TRUE(run.runAndWait());
@@ -144,7 +144,8 @@ TEST(ExportSessionPassthrough, KeepsRotationAndCopesWithReorderedAndUnevenFrames
     movieSpec.bFrames = 2;
     movieSpec.variableFrameRate = false;
     const QString reordered = scratchPath(QStringLiteral("bframes.mp4"));
-    ExportRun second{makeSession(movieFor(movieSpec), ExportPresetPassthrough, reordered, 1.3, 1.5)};
+    ExportRun second{
+        makeSession(movieFor(movieSpec), ExportPresetPassthrough, reordered, 1.3, 1.5)};
     ASSERT_TRUE(second.runAndWait());
     ASSERT_EQ(second.session->status(), int(ExportSessionStatus::Completed));
     const mediatest::ClipInfo b = probeClip(reordered);
@@ -195,7 +196,8 @@ TEST(ExportSessionPassthrough, KeepsALateAudioTrackInPlace) {
         for (double start : {0.0, 0.2}) {
             SCOPED_TRACE(testing::Message() << "remux '" << remux << "' start " << start);
             const QString output = scratchPath(QStringLiteral("late-audio.mp4"));
-            ExportRun run{makeSession(movieFor(movieSpec), ExportPresetPassthrough, output, start, 2.5)};
+            ExportRun run{
+                makeSession(movieFor(movieSpec), ExportPresetPassthrough, output, start, 2.5)};
             ASSERT_TRUE(run.runAndWait());
             ASSERT_EQ(run.session->status(), int(ExportSessionStatus::Completed));
             const mediatest::ClipInfo clip = probeClip(output);

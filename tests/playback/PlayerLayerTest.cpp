@@ -121,8 +121,8 @@ TEST(PlaybackPlayerLayer, ShowsTurnedRecordingsUpright) {
         SCOPED_TRACE(degrees);
         testmedia::MovieSpec movieSpec = playback_test::oneSecond();
         movieSpec.rotationDegrees = degrees;
-        auto item =
-            PlayerItem::playerItemWithURL(clipUrl(QStringLiteral("turned%1").arg(degrees), movieSpec));
+        auto item = PlayerItem::playerItemWithURL(
+            clipUrl(QStringLiteral("turned%1").arg(degrees), movieSpec));
         auto player = Player::playerWithPlayerItem(item);
         auto layer = std::make_unique<PlayerLayer>();
         // The coded size turned, so the picture fills the layer.

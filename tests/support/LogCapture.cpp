@@ -3,9 +3,8 @@
 namespace testing_support {
 
 class LogCapture::Sink final : public platform::LogSink {
-public:
-    void write(platform::LogLevel level, const QString& line) override
-    {
+  public:
+    void write(platform::LogLevel level, const QString& line) override {
         std::lock_guard lock(mutex);
         lines.append({level, line});
     }
@@ -13,42 +12,35 @@ public:
     QList<LogLine> lines;
 };
 
-LogCapture::LogCapture() : sink_(std::make_shared<Sink>())
-{
+LogCapture::LogCapture() : sink_(std::make_shared<Sink>()) {
     previous_ = platform::setLogSink(sink_);
 }
 
-LogCapture::~LogCapture()
-{
+LogCapture::~LogCapture() {
     platform::setLogSink(previous_);
 }
 
-QList<LogLine> LogCapture::lines() const
-{
+QList<LogLine> LogCapture::lines() const {
     std::lock_guard lock(sink_->mutex);
     return sink_->lines;
 }
 
-QStringList LogCapture::texts() const
-{
+QStringList LogCapture::texts() const {
     QStringList out;
     for (const LogLine& line : lines())
         out.append(line.text);
     return out;
 }
 
-int LogCapture::count(const QString& text) const
-{
+int LogCapture::count(const QString& text) const {
     return int(texts().count(text));
 }
 
-int LogCapture::count(platform::LogLevel level, const QString& text) const
-{
+int LogCapture::count(platform::LogLevel level, const QString& text) const {
     return int(lines().count(LogLine{level, text}));
 }
 
-QList<LogLine> LogCapture::startingWith(const QString& prefix) const
-{
+QList<LogLine> LogCapture::startingWith(const QString& prefix) const {
     QList<LogLine> out;
     for (const LogLine& line : lines())
         if (line.text.startsWith(prefix))
@@ -56,8 +48,7 @@ QList<LogLine> LogCapture::startingWith(const QString& prefix) const
     return out;
 }
 
-void LogCapture::clear()
-{
+void LogCapture::clear() {
     std::lock_guard lock(sink_->mutex);
     sink_->lines.clear();
 }

@@ -17,7 +17,7 @@ struct LogLine {
 
 // Installs itself as the log sink for its lifetime and records every line.
 class LogCapture {
-public:
+  public:
     LogCapture();
     ~LogCapture();
     LogCapture(const LogCapture&) = delete;
@@ -32,7 +32,7 @@ public:
     QList<LogLine> startingWith(const QString& prefix) const;
     void clear();
 
-private:
+  private:
     class Sink;
     std::shared_ptr<Sink> sink_;
     std::shared_ptr<platform::LogSink> previous_;

@@ -4,35 +4,30 @@
 
 namespace testing_support {
 namespace {
-QString nameOf(const QString& path)
-{
+QString nameOf(const QString& path) {
     return QFileInfo(path).fileName();
 }
 } // namespace
 
-void ScriptedFileSystem::failRemovalOf(const QString& name, int code)
-{
+void ScriptedFileSystem::failRemovalOf(const QString& name, int code) {
     std::lock_guard lock(mutex_);
     failingRemovals_.insert(name, code);
 }
 
-void ScriptedFileSystem::failAttributesOf(const QString& name)
-{
+void ScriptedFileSystem::failAttributesOf(const QString& name) {
     std::lock_guard lock(mutex_);
     failingAttributes_.insert(name);
 }
 
 QStringList ScriptedFileSystem::contentsOfDirectoryAtPath(const QString& path,
-                                                          platform::ErrorPtr* error) const
-{
+                                                          platform::ErrorPtr* error) const {
     QStringList names = LocalFileSystem::contentsOfDirectoryAtPath(path, error);
     names.sort();
     return names;
 }
 
 std::optional<platform::ItemAttributes>
-ScriptedFileSystem::attributesOfItemAtPath(const QString& path, platform::ErrorPtr* error) const
-{
+ScriptedFileSystem::attributesOfItemAtPath(const QString& path, platform::ErrorPtr* error) const {
     {
         std::lock_guard lock(mutex_);
         if (failingAttributes_.contains(nameOf(path))) {
@@ -44,16 +39,15 @@ ScriptedFileSystem::attributesOfItemAtPath(const QString& path, platform::ErrorP
 }
 
 std::optional<platform::FileSystemAttributes>
-ScriptedFileSystem::attributesOfFileSystemForPath(const QString& path, platform::ErrorPtr* error) const
-{
+ScriptedFileSystem::attributesOfFileSystemForPath(const QString& path,
+                                                  platform::ErrorPtr* error) const {
     auto attributes = LocalFileSystem::attributesOfFileSystemForPath(path, error);
     if (attributes && freeSize_)
         attributes->freeSize = *freeSize_;
     return attributes;
 }
 
-bool ScriptedFileSystem::removeItemAtPath(const QString& path, platform::ErrorPtr* error)
-{
+bool ScriptedFileSystem::removeItemAtPath(const QString& path, platform::ErrorPtr* error) {
     int code = 0;
     {
         std::lock_guard lock(mutex_);
@@ -67,8 +61,7 @@ bool ScriptedFileSystem::removeItemAtPath(const QString& path, platform::ErrorPt
     return LocalFileSystem::removeItemAtPath(path, error);
 }
 
-QStringList ScriptedFileSystem::removals() const
-{
+QStringList ScriptedFileSystem::removals() const {
     std::lock_guard lock(mutex_);
     return removals_;
 }

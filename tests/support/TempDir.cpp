@@ -7,8 +7,7 @@
 
 namespace testing_support {
 
-void ScopedEnv::remember(const char* name)
-{
+void ScopedEnv::remember(const char* name) {
     for (auto& [saved, value] : saved_)
         if (saved == name)
             return;
@@ -17,20 +16,17 @@ void ScopedEnv::remember(const char* name)
                                               : std::nullopt);
 }
 
-void ScopedEnv::set(const char* name, const QByteArray& value)
-{
+void ScopedEnv::set(const char* name, const QByteArray& value) {
     remember(name);
     qputenv(name, value);
 }
 
-void ScopedEnv::unset(const char* name)
-{
+void ScopedEnv::unset(const char* name) {
     remember(name);
     qunsetenv(name);
 }
 
-ScopedEnv::~ScopedEnv()
-{
+ScopedEnv::~ScopedEnv() {
     for (auto it = saved_.rbegin(); it != saved_.rend(); ++it) {
         if (it->second)
             qputenv(it->first.constData(), *it->second);
@@ -39,23 +35,20 @@ ScopedEnv::~ScopedEnv()
     }
 }
 
-MobileRoot::MobileRoot() : env_("TAMSEL_MOBILE_ROOT", QByteArray())
-{
+MobileRoot::MobileRoot() : env_("TAMSEL_MOBILE_ROOT", QByteArray()) {
     env_.set("TAMSEL_MOBILE_ROOT", dir_.path().toLocal8Bit());
 }
 
-QString MobileRoot::hostPath(const QString& relative) const
-{
+QString MobileRoot::hostPath(const QString& relative) const {
     return relative.isEmpty() ? dir_.path() : dir_.path() + QLatin1Char('/') + relative;
 }
 
-void MobileRoot::makeLibrary(bool withTempDir) const
-{
-    QDir().mkpath(hostPath(withTempDir ? QStringLiteral("Library/Tamsel") : QStringLiteral("Library")));
+void MobileRoot::makeLibrary(bool withTempDir) const {
+    QDir().mkpath(
+        hostPath(withTempDir ? QStringLiteral("Library/Tamsel") : QStringLiteral("Library")));
 }
 
-void writeFile(const QString& hostPath, qint64 size)
-{
+void writeFile(const QString& hostPath, qint64 size) {
     QDir().mkpath(QFileInfo(hostPath).absolutePath());
     QFile file(hostPath);
     if (file.open(QIODevice::WriteOnly))

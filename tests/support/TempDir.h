@@ -10,7 +10,7 @@ namespace testing_support {
 
 // Sets environment variables for its lifetime and restores the old values.
 class ScopedEnv {
-public:
+  public:
     ScopedEnv() = default;
     ScopedEnv(const char* name, const QByteArray& value) { set(name, value); }
     ~ScopedEnv();
@@ -20,7 +20,7 @@ public:
     void set(const char* name, const QByteArray& value);
     void unset(const char* name);
 
-private:
+  private:
     std::vector<std::pair<QByteArray, std::optional<QByteArray>>> saved_;
     void remember(const char* name);
 };
@@ -28,13 +28,13 @@ private:
 // A temporary directory that becomes the device's "/private/var/mobile/" for
 // its lifetime, so "/private/var/mobile/Library/Tamsel/" lands inside it.
 class MobileRoot {
-public:
+  public:
     MobileRoot();
     QString hostPath(const QString& relative = QString()) const;
     // Creates "Library/Tamsel" (or only "Library" when `withTempDir` is false).
     void makeLibrary(bool withTempDir = true) const;
 
-private:
+  private:
     QTemporaryDir dir_;
     ScopedEnv env_;
 };

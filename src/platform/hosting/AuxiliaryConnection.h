@@ -16,10 +16,11 @@ class MessageChannel;
 // the interface each side exports. Messages leave on the connection's own
 // serial thread, so a slow host never blocks the main thread.
 class AuxiliaryConnection : public std::enable_shared_from_this<AuxiliaryConnection> {
-public:
+  public:
     // `channel` may be null: a connection without a host, whose every message
     // fails with ConnectionInvalid.
-    AuxiliaryConnection(std::shared_ptr<MessageChannel> channel, InterfaceDescription exportedInterface,
+    AuxiliaryConnection(std::shared_ptr<MessageChannel> channel,
+                        InterfaceDescription exportedInterface,
                         InterfaceDescription remoteObjectInterface);
     ~AuxiliaryConnection();
 
@@ -27,7 +28,8 @@ public:
     const InterfaceDescription& remoteObjectInterface() const { return remote_; }
 
     // A new proxy on this connection for each call.
-    std::shared_ptr<RemoteObjectProxy> remoteObjectProxyWithErrorHandler(RemoteObjectProxy::ErrorHandler handler);
+    std::shared_ptr<RemoteObjectProxy>
+    remoteObjectProxyWithErrorHandler(RemoteObjectProxy::ErrorHandler handler);
 
     // Queues `message` on the connection's thread; `done` gets the outcome
     // there (null when the bytes went out).
@@ -36,7 +38,7 @@ public:
     // Waits until every queued message has been sent (or has failed).
     void flush();
 
-private:
+  private:
     std::shared_ptr<MessageChannel> channel_;
     InterfaceDescription exported_;
     InterfaceDescription remote_;

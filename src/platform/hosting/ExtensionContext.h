@@ -16,8 +16,9 @@ namespace platform {
 // Made and owned by the extension entry; used on the main thread, except
 // inputItems(), which any thread may read.
 class ExtensionContext {
-public:
-    ExtensionContext(QList<ExtensionItem> inputItems, std::shared_ptr<AuxiliaryConnection> connection);
+  public:
+    ExtensionContext(QList<ExtensionItem> inputItems,
+                     std::shared_ptr<AuxiliaryConnection> connection);
     virtual ~ExtensionContext() = default;
 
     const QList<ExtensionItem>& inputItems() const { return inputItems_; }
@@ -27,7 +28,7 @@ public:
     std::shared_ptr<QObject> _principalObject() const { return principal_.lock(); }
     void setPrincipalObject(std::weak_ptr<QObject> principal) { principal_ = std::move(principal); }
 
-private:
+  private:
     QList<ExtensionItem> inputItems_;
     std::shared_ptr<AuxiliaryConnection> connection_;
     std::weak_ptr<QObject> principal_;

@@ -6,8 +6,7 @@
 
 namespace platform {
 
-std::unique_ptr<ExtensionEndpoint> ExtensionEndpoint::fromEnvironment()
-{
+std::unique_ptr<ExtensionEndpoint> ExtensionEndpoint::fromEnvironment() {
     bool ok = false;
     const int fd = qEnvironmentVariableIntValue(HostMessages::HostDescriptorVariable, &ok);
     // The descriptor must not leak into processes this one starts.
@@ -21,8 +20,8 @@ std::unique_ptr<ExtensionEndpoint> ExtensionEndpoint::fromEnvironment()
     return std::make_unique<ExtensionEndpoint>(channel);
 }
 
-ExtensionEndpoint::ExtensionEndpoint(std::shared_ptr<MessageChannel> channel) : channel_(std::move(channel))
-{
+ExtensionEndpoint::ExtensionEndpoint(std::shared_ptr<MessageChannel> channel)
+    : channel_(std::move(channel)) {
     if (!channel_)
         return;
     channel_->onMessage = [this](const QCborMap& message) {

@@ -13,7 +13,7 @@ namespace platform {
 // request and the host's dismissal, and notices when the host has gone.
 // Lives on the main thread; its callbacks run there.
 class ExtensionEndpoint {
-public:
+  public:
     // The endpoint on the descriptor named by TAMSEL_HOST_FD; one without a
     // host (channel() null) when there is none.
     static std::unique_ptr<ExtensionEndpoint> fromEnvironment();
@@ -26,7 +26,7 @@ public:
     std::function<void()> onDismiss;
     std::function<void()> onHostGone;
 
-private:
+  private:
     std::shared_ptr<MessageChannel> channel_;
 };
 

@@ -4,8 +4,7 @@
 
 namespace platform {
 
-QCborMap ExtensionItem::toCbor() const
-{
+QCborMap ExtensionItem::toCbor() const {
     QCborArray wireAttachments;
     for (const auto& provider : attachments) {
         QCborArray types;
@@ -18,8 +17,7 @@ QCborMap ExtensionItem::toCbor() const
                     {QStringLiteral("attachments"), wireAttachments}};
 }
 
-ExtensionItem ExtensionItem::fromCbor(const QCborValue& wire)
-{
+ExtensionItem ExtensionItem::fromCbor(const QCborValue& wire) {
     const QCborMap map = wire.toMap();
     ExtensionItem item;
     item.attributedTitle = map.value(QStringLiteral("title")).toString();
@@ -28,22 +26,20 @@ ExtensionItem ExtensionItem::fromCbor(const QCborValue& wire)
         for (const QCborValue& type : attachment.toMap().value(QStringLiteral("types")).toArray())
             if (type.isString())
                 types.append(type.toString());
-        item.attachments.append(
-            std::make_shared<ItemProvider>(attachment.toMap().value(QStringLiteral("value")), types));
+        item.attachments.append(std::make_shared<ItemProvider>(
+            attachment.toMap().value(QStringLiteral("value")), types));
     }
     return item;
 }
 
-QCborArray encodeExtensionItems(const QList<ExtensionItem>& items)
-{
+QCborArray encodeExtensionItems(const QList<ExtensionItem>& items) {
     QCborArray array;
     for (const ExtensionItem& item : items)
         array.append(item.toCbor());
     return array;
 }
 
-QList<ExtensionItem> decodeExtensionItems(const QCborValue& wire)
-{
+QList<ExtensionItem> decodeExtensionItems(const QCborValue& wire) {
     QList<ExtensionItem> items;
     for (const QCborValue& item : wire.toArray())
         items.append(ExtensionItem::fromCbor(item));

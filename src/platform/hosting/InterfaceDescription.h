@@ -12,8 +12,8 @@ struct InterfaceDescription {
     QString protocolName;
     QStringList selectors;
 
-    static InterfaceDescription interfaceWithProtocol(const QString& name, const QStringList& selectors)
-    {
+    static InterfaceDescription interfaceWithProtocol(const QString& name,
+                                                      const QStringList& selectors) {
         return {name, selectors};
     }
     bool responds(const QString& selector) const { return selectors.contains(selector); }

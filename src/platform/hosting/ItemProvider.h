@@ -13,7 +13,7 @@ namespace platform {
 // The value stays in its wire form until it is loaded, so a value this side
 // cannot read fails its load instead of failing the whole request.
 class ItemProvider {
-public:
+  public:
     // The type every data item conforms to.
     static const QString GenericDataTypeIdentifier; // "application/octet-stream"
 
@@ -46,7 +46,7 @@ public:
     static QCborValue encode(const QVariant& item);
     static QVariant decode(const QCborValue& wire); // invalid QVariant when unreadable
 
-private:
+  private:
     QCborValue wire_;
     QStringList types_;
 };

@@ -9,8 +9,7 @@
 
 namespace platform {
 
-std::pair<int, int> makeSocketPair()
-{
+std::pair<int, int> makeSocketPair() {
     int fds[2];
     if (::socketpair(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0, fds) != 0)
         return {-1, -1};
@@ -18,8 +17,7 @@ std::pair<int, int> makeSocketPair()
 }
 
 MessageChannel::MessageChannel(int socketDescriptor, QObject* parent)
-    : QObject(parent), fd_(socketDescriptor)
-{
+    : QObject(parent), fd_(socketDescriptor) {
     if (fd_ < 0) {
         closed_ = true;
         return;
@@ -28,19 +26,16 @@ MessageChannel::MessageChannel(int socketDescriptor, QObject* parent)
     connect(notifier_, &QSocketNotifier::activated, this, &MessageChannel::readAvailable);
 }
 
-MessageChannel::~MessageChannel()
-{
+MessageChannel::~MessageChannel() {
     close();
 }
 
-bool MessageChannel::isOpen() const
-{
+bool MessageChannel::isOpen() const {
     std::lock_guard lock(sendMutex_);
     return !closed_;
 }
 
-void MessageChannel::close()
-{
+void MessageChannel::close() {
     std::lock_guard lock(sendMutex_);
     if (closed_)
         return;
@@ -50,8 +45,7 @@ void MessageChannel::close()
     ::close(fd_);
 }
 
-ErrorPtr MessageChannel::send(const QCborMap& message)
-{
+ErrorPtr MessageChannel::send(const QCborMap& message) {
     const QByteArray payload = message.toCborValue().toCbor();
     QByteArray frame(4, '\0');
     qToBigEndian<quint32>(quint32(payload.size()), frame.data());
@@ -59,10 +53,12 @@ ErrorPtr MessageChannel::send(const QCborMap& message)
 
     std::lock_guard lock(sendMutex_);
     if (closed_)
-        return makeError(EPIPE, QStringLiteral("POSIX"), QStringLiteral("the connection is closed"));
+        return makeError(EPIPE, QStringLiteral("POSIX"),
+                         QStringLiteral("the connection is closed"));
     qsizetype sent = 0;
     while (sent < frame.size()) {
-        const ssize_t n = ::send(fd_, frame.constData() + sent, size_t(frame.size() - sent), MSG_NOSIGNAL);
+        const ssize_t n =
+            ::send(fd_, frame.constData() + sent, size_t(frame.size() - sent), MSG_NOSIGNAL);
         if (n < 0) {
             if (errno == EINTR)
                 continue;
@@ -73,8 +69,7 @@ ErrorPtr MessageChannel::send(const QCborMap& message)
     return nullptr;
 }
 
-void MessageChannel::readAvailable()
-{
+void MessageChannel::readAvailable() {
     char chunk[64 * 1024];
     const ssize_t n = ::recv(fd_, chunk, sizeof chunk, MSG_DONTWAIT);
     if (n < 0 && (errno == EAGAIN || errno == EINTR))
@@ -106,8 +101,7 @@ void MessageChannel::readAvailable()
     }
 }
 
-void MessageChannel::closeFromPeer()
-{
+void MessageChannel::closeFromPeer() {
     if (!isOpen())
         return;
     close();

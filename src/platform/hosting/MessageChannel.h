@@ -22,7 +22,7 @@ namespace platform {
 // sends can crash this side.
 class MessageChannel : public QObject {
     Q_OBJECT
-public:
+  public:
     static constexpr qint64 MaximumMessageSize = 16 * 1024 * 1024;
 
     explicit MessageChannel(int socketDescriptor, QObject* parent = nullptr);
@@ -39,7 +39,7 @@ public:
     bool isOpen() const;
     void close();
 
-private:
+  private:
     void readAvailable();
     void closeFromPeer();
 

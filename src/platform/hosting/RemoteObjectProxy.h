@@ -16,11 +16,15 @@ class AuxiliaryConnection;
 // connection's own thread, in the order sent. When it cannot be delivered the
 // error handler is called on that thread; nothing else happens.
 class RemoteObjectProxy {
-public:
+  public:
     using ErrorHandler = std::function<void(ErrorPtr error)>;
 
     // Error codes of undeliverable messages besides the POSIX ones.
-    enum ErrorCode { ConnectionInvalid = 4097, ConnectionInterrupted = 4099, UnknownSelector = 4100 };
+    enum ErrorCode {
+        ConnectionInvalid = 4097,
+        ConnectionInterrupted = 4099,
+        UnknownSelector = 4100
+    };
 
     RemoteObjectProxy(std::shared_ptr<AuxiliaryConnection> connection, ErrorHandler errorHandler);
 
@@ -30,7 +34,7 @@ public:
     // The message of the host protocol.
     void extensionDidFinishWithActivityTypes(const QStringList& activityTypes);
 
-private:
+  private:
     std::shared_ptr<AuxiliaryConnection> connection_;
     ErrorHandler errorHandler_;
 };

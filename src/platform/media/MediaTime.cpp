@@ -8,16 +8,14 @@ namespace {
 
 // a * b / c rounded to nearest, without overflowing for the magnitudes of
 // media times (128-bit intermediate).
-std::int64_t rescale(std::int64_t a, std::int64_t b, std::int64_t c)
-{
+std::int64_t rescale(std::int64_t a, std::int64_t b, std::int64_t c) {
     const __int128 product = static_cast<__int128>(a) * b;
     const __int128 half = c / 2;
     const __int128 rounded = product >= 0 ? (product + half) / c : (product - half) / c;
     return static_cast<std::int64_t>(rounded);
 }
 
-int rank(const MediaTime& t)
-{
+int rank(const MediaTime& t) {
     if (!t.isValid())
         return 0;
     if (t.flags & MediaTime::NegativeInfinity)
@@ -31,15 +29,13 @@ int rank(const MediaTime& t)
 
 } // namespace
 
-MediaTime MediaTime::make(std::int64_t value, std::int32_t timescale)
-{
+MediaTime MediaTime::make(std::int64_t value, std::int32_t timescale) {
     if (timescale <= 0)
         return invalid();
     return {value, timescale, Valid, 0};
 }
 
-MediaTime MediaTime::fromSeconds(double seconds, std::int32_t timescale)
-{
+MediaTime MediaTime::fromSeconds(double seconds, std::int32_t timescale) {
     if (std::isnan(seconds) || timescale <= 0)
         return invalid();
     if (std::isinf(seconds))
@@ -54,8 +50,7 @@ MediaTime MediaTime::fromSeconds(double seconds, std::int32_t timescale)
     return t;
 }
 
-double MediaTime::seconds() const
-{
+double MediaTime::seconds() const {
     if (!isValid() || (flags & Indefinite))
         return std::numeric_limits<double>::quiet_NaN();
     if (flags & PositiveInfinity)
@@ -65,8 +60,7 @@ double MediaTime::seconds() const
     return double(value) / double(timescale);
 }
 
-MediaTime MediaTime::convertScale(std::int32_t newTimescale) const
-{
+MediaTime MediaTime::convertScale(std::int32_t newTimescale) const {
     if (!isNumeric() || newTimescale <= 0)
         return newTimescale <= 0 ? invalid() : *this;
     MediaTime t = make(rescale(value, newTimescale, timescale), newTimescale);
@@ -76,8 +70,7 @@ MediaTime MediaTime::convertScale(std::int32_t newTimescale) const
     return t;
 }
 
-std::strong_ordering operator<=>(const MediaTime& a, const MediaTime& b)
-{
+std::strong_ordering operator<=>(const MediaTime& a, const MediaTime& b) {
     const int ra = rank(a), rb = rank(b);
     if (ra != rb || ra != 2)
         return ra <=> rb;
@@ -85,23 +78,21 @@ std::strong_ordering operator<=>(const MediaTime& a, const MediaTime& b)
         return a.epoch <=> b.epoch;
     const __int128 left = static_cast<__int128>(a.value) * b.timescale;
     const __int128 right = static_cast<__int128>(b.value) * a.timescale;
-    return left < right ? std::strong_ordering::less
-                        : left > right ? std::strong_ordering::greater : std::strong_ordering::equal;
+    return left < right   ? std::strong_ordering::less
+           : left > right ? std::strong_ordering::greater
+                          : std::strong_ordering::equal;
 }
 
-MediaTime operator+(const MediaTime& a, const MediaTime& b)
-{
+MediaTime operator+(const MediaTime& a, const MediaTime& b) {
     if (!a.isNumeric() || !b.isNumeric())
-        return !a.isValid() || !b.isValid() ? MediaTime::invalid()
-                                            : (a.isNumeric() ? b : a);
+        return !a.isValid() || !b.isValid() ? MediaTime::invalid() : (a.isNumeric() ? b : a);
     if (a.timescale == b.timescale)
         return MediaTime::make(a.value + b.value, a.timescale);
     const std::int32_t scale = std::max(a.timescale, b.timescale);
     return MediaTime::make(a.convertScale(scale).value + b.convertScale(scale).value, scale);
 }
 
-MediaTime operator-(const MediaTime& a, const MediaTime& b)
-{
+MediaTime operator-(const MediaTime& a, const MediaTime& b) {
     MediaTime negated = b;
     if (b.isNumeric())
         negated.value = -b.value;
@@ -112,8 +103,7 @@ MediaTime operator-(const MediaTime& a, const MediaTime& b)
     return a + negated;
 }
 
-QString MediaTime::description() const
-{
+QString MediaTime::description() const {
     if (!isValid())
         return QStringLiteral("{invalid}");
     if (!isNumeric())

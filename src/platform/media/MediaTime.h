@@ -1,8 +1,8 @@
 #pragma once
 
 #include <QString>
-#include <cstdint>
 #include <compare>
+#include <cstdint>
 
 namespace platform {
 
@@ -31,8 +31,7 @@ struct MediaTime {
     static MediaTime fromSeconds(double seconds, std::int32_t timescale);
 
     bool isValid() const { return (flags & Valid) != 0; }
-    bool isNumeric() const
-    {
+    bool isNumeric() const {
         return isValid() && !(flags & (PositiveInfinity | NegativeInfinity | Indefinite));
     }
     // NaN when invalid or indefinite; +/-inf for the infinities.
@@ -58,9 +57,13 @@ struct MediaTimeRange {
     MediaTime duration;
 
     static MediaTimeRange make(MediaTime start, MediaTime duration) { return {start, duration}; }
-    static MediaTimeRange fromStartToEnd(MediaTime start, MediaTime end) { return {start, end - start}; }
+    static MediaTimeRange fromStartToEnd(MediaTime start, MediaTime end) {
+        return {start, end - start};
+    }
     MediaTime end() const { return start + duration; }
-    bool isValid() const { return start.isValid() && duration.isValid() && duration >= MediaTime::zero(); }
+    bool isValid() const {
+        return start.isValid() && duration.isValid() && duration >= MediaTime::zero();
+    }
     bool isEmpty() const { return !isValid() || duration == MediaTime::zero(); }
     bool containsTime(const MediaTime& t) const { return t >= start && t < end(); }
     friend bool operator==(const MediaTimeRange&, const MediaTimeRange&) = default;

@@ -80,10 +80,9 @@ bool qualifies(const QByteArray& trak, bool* syncTable) {
             const quint32 count = mp4::read32(trak, elst->body + 4);
             const bool wide = trak[elst->body] == 1;
             const qint64 firstMediaTime = elst->body + 8 + (wide ? 8 : 4);
-            const bool delayFirst =
-                count == 2 && elst->end >= firstMediaTime + 8 &&
-                (wide ? qint64(mp4::read64(trak, firstMediaTime)) == -1
-                      : qint32(mp4::read32(trak, firstMediaTime)) == -1);
+            const bool delayFirst = count == 2 && elst->end >= firstMediaTime + 8 &&
+                                    (wide ? qint64(mp4::read64(trak, firstMediaTime)) == -1
+                                          : qint32(mp4::read32(trak, firstMediaTime)) == -1);
             if (count > 1 && !delayFirst)
                 return false;
         }

@@ -10,29 +10,25 @@ namespace {
 const QString kMobilePrefix = QStringLiteral("/private/var/mobile");
 const QString kSystemPrefix = QStringLiteral("/System");
 
-QString withoutTrailingSlash(QString path)
-{
+QString withoutTrailingSlash(QString path) {
     while (path.size() > 1 && path.endsWith(QLatin1Char('/')))
         path.chop(1);
     return path;
 }
 
-QString envPath(const char* name)
-{
+QString envPath(const char* name) {
     const QString value = qEnvironmentVariable(name);
     return value.isEmpty() ? QString() : withoutTrailingSlash(value);
 }
 
 // `path` is `prefix` itself or lies under it.
-bool under(const QString& path, const QString& prefix)
-{
+bool under(const QString& path, const QString& prefix) {
     return path == prefix || path.startsWith(prefix + QLatin1Char('/'));
 }
 
 } // namespace
 
-QString mobileRoot()
-{
+QString mobileRoot() {
     if (QString root = envPath("TAMSEL_MOBILE_ROOT"); !root.isEmpty())
         return root;
     QString dataHome = envPath("XDG_DATA_HOME");
@@ -41,8 +37,7 @@ QString mobileRoot()
     return dataHome + QStringLiteral("/tamsel/mobile");
 }
 
-QString systemRoot()
-{
+QString systemRoot() {
     if (QString root = envPath("TAMSEL_SYSTEM_ROOT"); !root.isEmpty())
         return root;
     if (QCoreApplication::instance()) {
@@ -57,8 +52,7 @@ QString systemRoot()
     return QStringLiteral(TAMSEL_INSTALL_RESOURCE_DIR "/System");
 }
 
-QString toHost(const QString& path)
-{
+QString toHost(const QString& path) {
     if (under(path, kMobilePrefix))
         return mobileRoot() + path.mid(kMobilePrefix.size());
     if (under(path, kSystemPrefix))
@@ -66,8 +60,7 @@ QString toHost(const QString& path)
     return path;
 }
 
-QString toDevice(const QString& hostPath)
-{
+QString toDevice(const QString& hostPath) {
     const QString mobile = mobileRoot();
     if (under(hostPath, mobile))
         return kMobilePrefix + hostPath.mid(mobile.size());
@@ -77,13 +70,11 @@ QString toDevice(const QString& hostPath)
     return hostPath;
 }
 
-void prepareDevice()
-{
+void prepareDevice() {
     QDir().mkpath(mobileRoot() + QStringLiteral("/Library"));
 }
 
-QString hostPathOfUrl(const QUrl& url)
-{
+QString hostPathOfUrl(const QUrl& url) {
     return url.isLocalFile() ? toHost(url.toLocalFile()) : QString();
 }
 

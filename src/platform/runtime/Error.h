@@ -10,7 +10,7 @@ namespace platform {
 // whoever receives one may keep it as long as it likes. "No error" is a null
 // ErrorPtr.
 class Error {
-public:
+  public:
     Error(int code, QString domain, QString message);
 
     // The signed integer code that logs and callers compare (errno values for
@@ -28,7 +28,7 @@ public:
     // lines print for an error.
     QString description() const;
 
-private:
+  private:
     int code_;
     QString domain_;
     QString message_;
@@ -44,8 +44,7 @@ ErrorPtr posixError(const std::error_code& ec, const QString& devicePath);
 
 // Writes `error` through `out` when `out` is not null; the out-parameter
 // convention of the file-system services.
-inline void setError(ErrorPtr* out, ErrorPtr error)
-{
+inline void setError(ErrorPtr* out, ErrorPtr error) {
     if (out)
         *out = std::move(error);
 }

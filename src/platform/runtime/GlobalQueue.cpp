@@ -13,8 +13,7 @@ thread_local bool onWorker = false;
 
 // The pools are never destroyed: a job still running at static destruction
 // time must not find its pool gone. drain() is the orderly way out.
-QThreadPool* pool(QueuePriority priority)
-{
+QThreadPool* pool(QueuePriority priority) {
     static QThreadPool* background = [] {
         auto* p = new QThreadPool;
         p->setThreadPriority(QThread::LowPriority);
@@ -31,8 +30,7 @@ QThreadPool* pool(QueuePriority priority)
 
 } // namespace
 
-void async(QueuePriority priority, std::function<void()> job)
-{
+void async(QueuePriority priority, std::function<void()> job) {
     pool(priority)->start([job = std::move(job)]() mutable {
         onWorker = true;
         job();
@@ -40,8 +38,7 @@ void async(QueuePriority priority, std::function<void()> job)
     });
 }
 
-void drain()
-{
+void drain() {
     // A job may queue another on either pool, so wait until both stay idle.
     // On the main thread the loop keeps turning meanwhile: a job may be
     // waiting for the main queue to run something for it.
@@ -58,6 +55,8 @@ void drain()
     }
 }
 
-bool isWorkerThread() { return onWorker; }
+bool isWorkerThread() {
+    return onWorker;
+}
 
 } // namespace platform::GlobalQueue

@@ -10,11 +10,10 @@ namespace platform {
 namespace {
 
 class SystemSink final : public LogSink {
-public:
+  public:
     SystemSink() { openlog("tamsel", LOG_PID, LOG_USER); }
 
-    void write(LogLevel level, const QString& line) override
-    {
+    void write(LogLevel level, const QString& line) override {
         const QByteArray bytes = line.toUtf8();
         switch (level) {
         case LogLevel::Default:
@@ -37,28 +36,24 @@ struct LogState {
     int nextToken = 1;
 };
 
-LogState& state()
-{
+LogState& state() {
     static LogState s;
     return s;
 }
 
-std::shared_ptr<LogSink> systemSink()
-{
+std::shared_ptr<LogSink> systemSink() {
     static auto sink = std::make_shared<SystemSink>();
     return sink;
 }
 
-bool mirrorToStderr()
-{
+bool mirrorToStderr() {
     static const bool mirror = qgetenv("TAMSEL_LOG_STDERR") == "1";
     return mirror;
 }
 
 } // namespace
 
-const char* logLevelName(LogLevel level)
-{
+const char* logLevelName(LogLevel level) {
     switch (level) {
     case LogLevel::Default:
         return "default";
@@ -70,8 +65,7 @@ const char* logLevelName(LogLevel level)
     return "?";
 }
 
-void log(LogLevel level, const QString& line)
-{
+void log(LogLevel level, const QString& line) {
     std::shared_ptr<LogSink> sink;
     std::map<int, LogObserver> observers;
     {
@@ -87,23 +81,20 @@ void log(LogLevel level, const QString& line)
         observer(level, line);
 }
 
-std::shared_ptr<LogSink> setLogSink(std::shared_ptr<LogSink> sink)
-{
+std::shared_ptr<LogSink> setLogSink(std::shared_ptr<LogSink> sink) {
     std::lock_guard lock(state().mutex);
     std::swap(state().sink, sink);
     return sink;
 }
 
-int addLogObserver(LogObserver observer)
-{
+int addLogObserver(LogObserver observer) {
     std::lock_guard lock(state().mutex);
     const int token = state().nextToken++;
     state().observers.emplace(token, std::move(observer));
     return token;
 }
 
-void removeLogObserver(int token)
-{
+void removeLogObserver(int token) {
     std::lock_guard lock(state().mutex);
     state().observers.erase(token);
 }

@@ -16,7 +16,7 @@ enum class LogLevel {
 // Where log lines go. Lines arrive whole, without a trailing newline, on any
 // thread; a sink must be safe to call from several threads at once.
 class LogSink {
-public:
+  public:
     virtual ~LogSink() = default;
     virtual void write(LogLevel level, const QString& line) = 0;
 };
@@ -25,9 +25,15 @@ public:
 // byte for byte; the sink adds nothing but the process identification that
 // syslog adds.
 void log(LogLevel level, const QString& line);
-inline void logDefault(const QString& line) { log(LogLevel::Default, line); }
-inline void logError(const QString& line) { log(LogLevel::Error, line); }
-inline void logConsole(const QString& line) { log(LogLevel::Console, line); }
+inline void logDefault(const QString& line) {
+    log(LogLevel::Default, line);
+}
+inline void logError(const QString& line) {
+    log(LogLevel::Error, line);
+}
+inline void logConsole(const QString& line) {
+    log(LogLevel::Console, line);
+}
 
 // Replaces the sink that receives every line and returns the one it replaces.
 // Passing null restores the system sink (syslog and stderr). With

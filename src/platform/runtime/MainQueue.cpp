@@ -9,8 +9,7 @@
 
 namespace platform::MainQueue {
 
-void async(std::function<void()> job)
-{
+void async(std::function<void()> job) {
     QCoreApplication* app = QCoreApplication::instance();
     if (!app) {
         logError(QStringLiteral("main queue: no application, job dropped"));
@@ -19,8 +18,7 @@ void async(std::function<void()> job)
     QMetaObject::invokeMethod(app, std::move(job), Qt::QueuedConnection);
 }
 
-void sync(const std::function<void()>& job)
-{
+void sync(const std::function<void()>& job) {
     if (isCurrent()) {
         job();
         return;
@@ -33,8 +31,7 @@ void sync(const std::function<void()>& job)
     QMetaObject::invokeMethod(app, job, Qt::BlockingQueuedConnection);
 }
 
-void runPending(int rounds)
-{
+void runPending(int rounds) {
     if (!isCurrent())
         return;
     for (int round = 0; round < rounds; ++round) {
@@ -43,8 +40,7 @@ void runPending(int rounds)
     }
 }
 
-bool isCurrent()
-{
+bool isCurrent() {
     QCoreApplication* app = QCoreApplication::instance();
     return app && QThread::currentThread() == app->thread();
 }

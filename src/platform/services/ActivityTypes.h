@@ -9,7 +9,9 @@ namespace platform {
 inline const QString SaveToAlbumActivityType = QStringLiteral("org.tamsel.activity.SaveToAlbum");
 inline const QString MailActivityType = QStringLiteral("org.tamsel.activity.Mail");
 inline const QString MessageActivityType = QStringLiteral("org.tamsel.activity.Message");
-inline const QString CopyToPasteboardActivityType = QStringLiteral("org.tamsel.activity.CopyToPasteboard");
-inline const QString PostToFacebookActivityType = QStringLiteral("org.tamsel.activity.PostToSocialNetwork");
+inline const QString CopyToPasteboardActivityType =
+    QStringLiteral("org.tamsel.activity.CopyToPasteboard");
+inline const QString PostToFacebookActivityType =
+    QStringLiteral("org.tamsel.activity.PostToSocialNetwork");
 
 } // namespace platform

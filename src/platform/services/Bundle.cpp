@@ -22,8 +22,7 @@ namespace {
 const QString kLprojSuffix = QStringLiteral(".lproj");
 
 // Platform classes and the framework bundles that hold them.
-const QHash<QString, QString>& classBundles()
-{
+const QHash<QString, QString>& classBundles() {
     static const QHash<QString, QString> table = {
         {QStringLiteral("PhotoAlbum"),
          QStringLiteral("/System/Library/Frameworks/TamselPhotos.framework")},
@@ -31,16 +30,14 @@ const QHash<QString, QString>& classBundles()
     return table;
 }
 
-QVariantMap readInfoJson(const QString& hostDir)
-{
+QVariantMap readInfoJson(const QString& hostDir) {
     QFile file(hostDir + QStringLiteral("/Info.json"));
     if (!file.open(QIODevice::ReadOnly))
         return {};
     return QJsonDocument::fromJson(file.readAll()).object().toVariantMap();
 }
 
-std::shared_ptr<Bundle> makeDirectoryBundle(const QString& path)
-{
+std::shared_ptr<Bundle> makeDirectoryBundle(const QString& path) {
     const QString host = QDir::cleanPath(DevicePaths::toHost(path));
     if (!QFileInfo(host).isDir())
         return nullptr;
@@ -51,14 +48,14 @@ std::shared_ptr<Bundle> makeDirectoryBundle(const QString& path)
     for (const QString& folder : folders) {
         const QString localization = folder.chopped(kLprojSuffix.size());
         localizations.append(localization);
-        if (auto info = readStringsFile(host + QLatin1Char('/') + folder + QStringLiteral("/InfoPlist.strings")))
+        if (auto info = readStringsFile(host + QLatin1Char('/') + folder +
+                                        QStringLiteral("/InfoPlist.strings")))
             localizedInfo.insert(localization, *info);
     }
     return std::make_shared<Bundle>(path, host, readInfoJson(host), localizedInfo, localizations);
 }
 
-std::shared_ptr<Bundle> makeApplicationBundle(const QString& identifier)
-{
+std::shared_ptr<Bundle> makeApplicationBundle(const QString& identifier) {
     QStringList dirs;
     QString dataHome = qEnvironmentVariable("XDG_DATA_HOME");
     if (dataHome.isEmpty())
@@ -70,7 +67,8 @@ std::shared_ptr<Bundle> makeApplicationBundle(const QString& identifier)
     dirs.append(dataDirs.split(QLatin1Char(':'), Qt::SkipEmptyParts));
 
     for (const QString& dir : dirs) {
-        const QString file = dir + QStringLiteral("/applications/") + identifier + QStringLiteral(".desktop");
+        const QString file =
+            dir + QStringLiteral("/applications/") + identifier + QStringLiteral(".desktop");
         auto entry = DesktopEntry::read(file);
         if (!entry)
             continue;
@@ -79,7 +77,8 @@ std::shared_ptr<Bundle> makeApplicationBundle(const QString& identifier)
             info.insert(Bundle::DisplayNameKey, entry->value(QStringLiteral("Name")));
         QHash<QString, QVariantMap> localizedInfo;
         QStringList localizations;
-        for (auto [localization, name] : entry->localizedValues(QStringLiteral("Name")).asKeyValueRange()) {
+        for (auto [localization, name] :
+             entry->localizedValues(QStringLiteral("Name")).asKeyValueRange()) {
             localizations.append(localization);
             localizedInfo.insert(localization, QVariantMap{{Bundle::DisplayNameKey, name}});
         }
@@ -94,12 +93,9 @@ std::shared_ptr<Bundle> makeApplicationBundle(const QString& identifier)
 Bundle::Bundle(QString path, QString hostPath, QVariantMap info,
                QHash<QString, QVariantMap> localizedInfo, QStringList localizations)
     : path_(std::move(path)), hostPath_(std::move(hostPath)), info_(std::move(info)),
-      localizedInfo_(std::move(localizedInfo)), localizations_(std::move(localizations))
-{
-}
+      localizedInfo_(std::move(localizedInfo)), localizations_(std::move(localizations)) {}
 
-std::shared_ptr<Bundle> Bundle::bundleWithPath(const QString& path)
-{
+std::shared_ptr<Bundle> Bundle::bundleWithPath(const QString& path) {
     // Bundles are process-wide, one per path, like the resources they stand for.
     static std::mutex mutex;
     static QHash<QString, std::shared_ptr<Bundle>> bundles;
@@ -113,8 +109,7 @@ std::shared_ptr<Bundle> Bundle::bundleWithPath(const QString& path)
     return bundle;
 }
 
-std::shared_ptr<Bundle> Bundle::bundleWithIdentifier(const QString& identifier)
-{
+std::shared_ptr<Bundle> Bundle::bundleWithIdentifier(const QString& identifier) {
     // An identifier is a reverse-DNS name; anything with a path separator in
     // it must not walk out of the applications folders.
     if (identifier.isEmpty() || identifier.contains(QLatin1Char('/')))
@@ -122,14 +117,12 @@ std::shared_ptr<Bundle> Bundle::bundleWithIdentifier(const QString& identifier)
     return makeApplicationBundle(identifier);
 }
 
-std::shared_ptr<Bundle> Bundle::bundleForClass(const QString& className)
-{
+std::shared_ptr<Bundle> Bundle::bundleForClass(const QString& className) {
     const QString path = classBundles().value(className);
     return path.isEmpty() ? nullptr : bundleWithPath(path);
 }
 
-QStringList Bundle::preferredLocalizations() const
-{
+QStringList Bundle::preferredLocalizations() const {
     QStringList order;
     auto add = [&](const QString& localization) {
         if (localizations_.contains(localization) && !order.contains(localization))
@@ -146,27 +139,25 @@ QStringList Bundle::preferredLocalizations() const
     return order;
 }
 
-QVariantMap Bundle::localizedInfoDictionary() const
-{
+QVariantMap Bundle::localizedInfoDictionary() const {
     const QStringList order = preferredLocalizations();
     return order.isEmpty() ? QVariantMap() : localizedInfo_.value(order.first());
 }
 
 QString Bundle::pathForResource(const QString& name, const QString& type,
-                                const QString& subdirectory, const QString& localization) const
-{
+                                const QString& subdirectory, const QString& localization) const {
     QString dir = hostPath_;
     if (!localization.isEmpty())
         dir += QLatin1Char('/') + localization + kLprojSuffix;
     if (!subdirectory.isEmpty())
         dir += QLatin1Char('/') + subdirectory;
-    const QString file = dir + QLatin1Char('/') + name + (type.isEmpty() ? QString() : QLatin1Char('.') + type);
+    const QString file =
+        dir + QLatin1Char('/') + name + (type.isEmpty() ? QString() : QLatin1Char('.') + type);
     return QFileInfo(file).isFile() ? file : QString();
 }
 
 std::shared_ptr<const QVariantMap> Bundle::stringTable(const QString& table,
-                                                       const QString& localization) const
-{
+                                                       const QString& localization) const {
     const std::string key = (localization + QLatin1Char('/') + table).toStdString();
     {
         std::lock_guard lock(cacheMutex_);
@@ -184,8 +175,7 @@ std::shared_ptr<const QVariantMap> Bundle::stringTable(const QString& table,
 }
 
 QString Bundle::localizedStringForKey(const QString& key, const QString& value,
-                                      const QString& table) const
-{
+                                      const QString& table) const {
     const QString tableName = table.isEmpty() ? QStringLiteral("Localizable") : table;
     for (const QString& localization : preferredLocalizations()) {
         if (auto strings = stringTable(tableName, localization); strings && strings->contains(key))

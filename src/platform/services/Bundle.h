@@ -17,7 +17,7 @@ namespace platform {
 // Bundles are immutable once made and safe to use from any thread; parsed
 // string tables are cached inside.
 class Bundle {
-public:
+  public:
     // Keys of the information dictionaries.
     static const QString DisplayNameKey; // "BundleDisplayName"
     static const QString NameKey;        // "BundleName"
@@ -71,7 +71,7 @@ public:
     Bundle(QString path, QString hostPath, QVariantMap info,
            QHash<QString, QVariantMap> localizedInfo, QStringList localizations);
 
-private:
+  private:
     QString path_;     // device path
     QString hostPath_; // where it is on this machine
     QVariantMap info_;

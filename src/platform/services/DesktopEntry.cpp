@@ -5,8 +5,7 @@
 namespace platform {
 namespace {
 
-QString unescape(const QString& raw)
-{
+QString unescape(const QString& raw) {
     QString out;
     out.reserve(raw.size());
     for (qsizetype i = 0; i < raw.size(); ++i) {
@@ -16,11 +15,21 @@ QString unescape(const QString& raw)
             continue;
         }
         switch (raw.at(++i).unicode()) {
-        case 's': out += QLatin1Char(' '); break;
-        case 'n': out += QLatin1Char('\n'); break;
-        case 't': out += QLatin1Char('\t'); break;
-        case 'r': out += QLatin1Char('\r'); break;
-        default: out += raw.at(i); break;
+        case 's':
+            out += QLatin1Char(' ');
+            break;
+        case 'n':
+            out += QLatin1Char('\n');
+            break;
+        case 't':
+            out += QLatin1Char('\t');
+            break;
+        case 'r':
+            out += QLatin1Char('\r');
+            break;
+        default:
+            out += raw.at(i);
+            break;
         }
     }
     return out;
@@ -28,8 +37,7 @@ QString unescape(const QString& raw)
 
 } // namespace
 
-std::optional<DesktopEntry> DesktopEntry::parse(const QString& text)
-{
+std::optional<DesktopEntry> DesktopEntry::parse(const QString& text) {
     DesktopEntry entry;
     bool inGroup = false;
     bool sawGroup = false;
@@ -54,16 +62,14 @@ std::optional<DesktopEntry> DesktopEntry::parse(const QString& text)
     return entry;
 }
 
-std::optional<DesktopEntry> DesktopEntry::read(const QString& hostPath)
-{
+std::optional<DesktopEntry> DesktopEntry::read(const QString& hostPath) {
     QFile file(hostPath);
     if (!file.open(QIODevice::ReadOnly))
         return std::nullopt;
     return parse(QString::fromUtf8(file.readAll()));
 }
 
-QHash<QString, QString> DesktopEntry::localizedValues(const QString& key) const
-{
+QHash<QString, QString> DesktopEntry::localizedValues(const QString& key) const {
     QHash<QString, QString> out;
     const QString prefix = key + QLatin1Char('[');
     for (auto [name, value] : values_.asKeyValueRange()) {

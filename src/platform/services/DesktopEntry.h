@@ -10,7 +10,7 @@ namespace platform {
 // (escapes resolved). Localised keys "Name[de_AT]" are kept under their full
 // name.
 class DesktopEntry {
-public:
+  public:
     // Null when the file is missing, unreadable or has no [Desktop Entry].
     static std::optional<DesktopEntry> read(const QString& hostPath);
     static std::optional<DesktopEntry> parse(const QString& text);
@@ -22,7 +22,7 @@ public:
     // region ("de-AT" for Name[de_AT]); the modifier part (@...) is dropped.
     QHash<QString, QString> localizedValues(const QString& key) const;
 
-private:
+  private:
     QHash<QString, QString> values_;
 };
 

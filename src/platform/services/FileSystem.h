@@ -14,7 +14,7 @@ namespace platform {
 struct ItemAttributes {
     std::uint64_t size = 0;
     QDateTime modificationDate; // invalid when unknown
-    QDateTime creationDate;     // birth time; the modification time where the file system keeps none
+    QDateTime creationDate; // birth time; the modification time where the file system keeps none
     bool isDirectory = false;
 };
 
@@ -28,7 +28,7 @@ struct FileSystemAttributes {
 // synchronous, runs on the caller's thread, may be called from any thread and
 // reports failure through the optional error out-parameter, never by throwing.
 class FileSystem {
-public:
+  public:
     virtual ~FileSystem() = default;
 
     // True when anything (file, directory, other) is at `path`; symbolic links

@@ -17,36 +17,31 @@ namespace {
 
 // A trailing slash would make the kernel insist on a directory; the file
 // manager asks about whatever is at the path, so it goes.
-QByteArray hostBytes(const QString& devicePath)
-{
+QByteArray hostBytes(const QString& devicePath) {
     QString host = DevicePaths::toHost(devicePath);
     while (host.size() > 1 && host.endsWith(QLatin1Char('/')))
         host.chop(1);
     return host.toLocal8Bit();
 }
 
-QDateTime fromTimestamp(const statx_timestamp& ts)
-{
+QDateTime fromTimestamp(const statx_timestamp& ts) {
     return QDateTime::fromMSecsSinceEpoch(ts.tv_sec * 1000 + ts.tv_nsec / 1000000);
 }
 
 } // namespace
 
-std::shared_ptr<FileSystem> FileSystem::local()
-{
+std::shared_ptr<FileSystem> FileSystem::local() {
     static auto instance = std::make_shared<LocalFileSystem>();
     return instance;
 }
 
-bool LocalFileSystem::fileExistsAtPath(const QString& path) const
-{
+bool LocalFileSystem::fileExistsAtPath(const QString& path) const {
     struct stat st;
     return ::lstat(hostBytes(path).constData(), &st) == 0;
 }
 
 bool LocalFileSystem::createDirectoryAtPath(const QString& path, bool withIntermediateDirectories,
-                                            ErrorPtr* error)
-{
+                                            ErrorPtr* error) {
     const QByteArray host = hostBytes(path);
     if (withIntermediateDirectories) {
         std::error_code ec;
@@ -64,8 +59,7 @@ bool LocalFileSystem::createDirectoryAtPath(const QString& path, bool withInterm
     return true;
 }
 
-QStringList LocalFileSystem::contentsOfDirectoryAtPath(const QString& path, ErrorPtr* error) const
-{
+QStringList LocalFileSystem::contentsOfDirectoryAtPath(const QString& path, ErrorPtr* error) const {
     QStringList names;
     DIR* dir = ::opendir(hostBytes(path).constData());
     if (!dir) {
@@ -82,8 +76,7 @@ QStringList LocalFileSystem::contentsOfDirectoryAtPath(const QString& path, Erro
 }
 
 std::optional<ItemAttributes> LocalFileSystem::attributesOfItemAtPath(const QString& path,
-                                                                      ErrorPtr* error) const
-{
+                                                                      ErrorPtr* error) const {
     struct statx stx;
     const unsigned mask = STATX_TYPE | STATX_SIZE | STATX_MTIME | STATX_BTIME;
     if (::statx(AT_FDCWD, hostBytes(path).constData(), AT_SYMLINK_NOFOLLOW, mask, &stx) != 0) {
@@ -94,14 +87,13 @@ std::optional<ItemAttributes> LocalFileSystem::attributesOfItemAtPath(const QStr
     attributes.size = stx.stx_size;
     attributes.isDirectory = S_ISDIR(stx.stx_mode);
     attributes.modificationDate = fromTimestamp(stx.stx_mtime);
-    attributes.creationDate = (stx.stx_mask & STATX_BTIME) ? fromTimestamp(stx.stx_btime)
-                                                           : attributes.modificationDate;
+    attributes.creationDate =
+        (stx.stx_mask & STATX_BTIME) ? fromTimestamp(stx.stx_btime) : attributes.modificationDate;
     return attributes;
 }
 
 std::optional<FileSystemAttributes>
-LocalFileSystem::attributesOfFileSystemForPath(const QString& path, ErrorPtr* error) const
-{
+LocalFileSystem::attributesOfFileSystemForPath(const QString& path, ErrorPtr* error) const {
     struct statvfs st;
     if (::statvfs(hostBytes(path).constData(), &st) != 0) {
         setError(error, posixError(errno, path));
@@ -113,8 +105,7 @@ LocalFileSystem::attributesOfFileSystemForPath(const QString& path, ErrorPtr* er
     return attributes;
 }
 
-bool LocalFileSystem::removeItemAtPath(const QString& path, ErrorPtr* error)
-{
+bool LocalFileSystem::removeItemAtPath(const QString& path, ErrorPtr* error) {
     std::error_code ec;
     const fs::path host(hostBytes(path).toStdString());
     if (!fs::exists(fs::symlink_status(host, ec))) {
@@ -129,8 +120,7 @@ bool LocalFileSystem::removeItemAtPath(const QString& path, ErrorPtr* error)
     return true;
 }
 
-bool LocalFileSystem::moveItemAtPath(const QString& from, const QString& to, ErrorPtr* error)
-{
+bool LocalFileSystem::moveItemAtPath(const QString& from, const QString& to, ErrorPtr* error) {
     const QByteArray hostFrom = hostBytes(from);
     const QByteArray hostTo = hostBytes(to);
     if (fileExistsAtPath(to)) {

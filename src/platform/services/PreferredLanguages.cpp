@@ -2,8 +2,7 @@
 
 namespace platform {
 
-QString languageCodeFromLocaleName(const QString& localeName)
-{
+QString languageCodeFromLocaleName(const QString& localeName) {
     QString name = localeName.section(QLatin1Char('.'), 0, 0).section(QLatin1Char('@'), 0, 0);
     if (name.isEmpty() || name == QLatin1String("C") || name == QLatin1String("POSIX"))
         return QString();
@@ -11,8 +10,7 @@ QString languageCodeFromLocaleName(const QString& localeName)
     return name;
 }
 
-QStringList preferredLanguages()
-{
+QStringList preferredLanguages() {
     QString locale;
     for (const char* variable : {"LC_ALL", "LC_MESSAGES", "LANG"}) {
         locale = qEnvironmentVariable(variable);

@@ -7,11 +7,10 @@ namespace platform {
 namespace {
 
 class Parser {
-public:
+  public:
     explicit Parser(const QString& text) : s_(text) {}
 
-    std::optional<QVariantMap> run()
-    {
+    std::optional<QVariantMap> run() {
         QVariantMap table;
         for (;;) {
             skipSpaceAndComments();
@@ -30,23 +29,20 @@ public:
         }
     }
 
-private:
+  private:
     bool atEnd() const { return i_ >= s_.size(); }
-    QChar peek(qsizetype ahead = 0) const
-    {
+    QChar peek(qsizetype ahead = 0) const {
         return i_ + ahead < s_.size() ? s_.at(i_ + ahead) : QChar();
     }
 
-    bool consume(QChar c)
-    {
+    bool consume(QChar c) {
         if (peek() != c)
             return false;
         ++i_;
         return true;
     }
 
-    void skipSpaceAndComments()
-    {
+    void skipSpaceAndComments() {
         while (!atEnd()) {
             if (peek().isSpace()) {
                 ++i_;
@@ -62,8 +58,7 @@ private:
         }
     }
 
-    std::optional<QString> token()
-    {
+    std::optional<QString> token() {
         if (peek() == QLatin1Char('"'))
             return quoted();
         QString word;
@@ -75,8 +70,7 @@ private:
         return word;
     }
 
-    std::optional<QString> quoted()
-    {
+    std::optional<QString> quoted() {
         ++i_; // opening quote
         QString out;
         while (!atEnd()) {
@@ -91,9 +85,15 @@ private:
                 return std::nullopt;
             const QChar e = s_.at(i_++);
             switch (e.unicode()) {
-            case 'n': out += QLatin1Char('\n'); break;
-            case 't': out += QLatin1Char('\t'); break;
-            case 'r': out += QLatin1Char('\r'); break;
+            case 'n':
+                out += QLatin1Char('\n');
+                break;
+            case 't':
+                out += QLatin1Char('\t');
+                break;
+            case 'r':
+                out += QLatin1Char('\r');
+                break;
             case 'U':
             case 'u': {
                 bool ok = false;
@@ -104,7 +104,9 @@ private:
                 i_ += 4;
                 break;
             }
-            default: out += e; break; // \" \\ \' and anything else stand for themselves
+            default:
+                out += e;
+                break; // \" \\ \' and anything else stand for themselves
             }
         }
         return std::nullopt; // unterminated
@@ -116,13 +118,11 @@ private:
 
 } // namespace
 
-std::optional<QVariantMap> parseStrings(const QString& text)
-{
+std::optional<QVariantMap> parseStrings(const QString& text) {
     return Parser(text).run();
 }
 
-std::optional<QVariantMap> readStringsFile(const QString& hostPath)
-{
+std::optional<QVariantMap> readStringsFile(const QString& hostPath) {
     QFile file(hostPath);
     if (!file.open(QIODevice::ReadOnly))
         return std::nullopt;

@@ -1,5 +1,5 @@
-#include "platform/runtime/Error.h"
 #include "platform/runtime/Log.h"
+#include "platform/runtime/Error.h"
 #include "support/LogCapture.h"
 
 #include <gtest/gtest.h>
@@ -8,25 +8,26 @@ using namespace platform;
 using testing_support::LogCapture;
 using testing_support::LogLine;
 
-TEST(Log, LinesReachTheInstalledSinkWithTheirLevelAndObserversSeeThemToo)
-{
+TEST(Log, LinesReachTheInstalledSinkWithTheirLevelAndObserversSeeThemToo) {
     QList<LogLine> observed;
     LogCapture capture;
-    const int token = addLogObserver([&](LogLevel level, const QString& text) { observed.append({level, text}); });
+    const int token = addLogObserver([&](LogLevel level, const QString& text) {
+        observed.append({level, text});
+    });
     logDefault("one");
     logError("two: 5");
     logConsole("error = three");
     removeLogObserver(token);
     logDefault("four");
 
-    const QList<LogLine> expected{{LogLevel::Default, "one"}, {LogLevel::Error, "two: 5"},
+    const QList<LogLine> expected{{LogLevel::Default, "one"},
+                                  {LogLevel::Error, "two: 5"},
                                   {LogLevel::Console, "error = three"}};
     EXPECT_EQ(capture.lines(), expected + QList<LogLine>({{LogLevel::Default, "four"}}));
     EXPECT_EQ(observed, expected);
 }
 
-TEST(Log, NestedCapturesRestoreTheSinkBeforeThem)
-{
+TEST(Log, NestedCapturesRestoreTheSinkBeforeThem) {
     LogCapture outer;
     {
         LogCapture inner;
@@ -37,12 +38,12 @@ TEST(Log, NestedCapturesRestoreTheSinkBeforeThem)
     EXPECT_EQ(outer.texts(), QStringList{"outer"});
 }
 
-TEST(Error, CarriesCodeAndDescribesItselfAndEachErrorHasItsOwnIdentity)
-{
+TEST(Error, CarriesCodeAndDescribesItselfAndEachErrorHasItsOwnIdentity) {
     const ErrorPtr a = posixError(2, "/private/var/mobile/x");
     const ErrorPtr b = posixError(2, "/private/var/mobile/x");
     EXPECT_EQ(a->code(), 2);
-    EXPECT_EQ(a->description(), "Error Domain=POSIX Code=2 \"/private/var/mobile/x: No such file or directory\"");
+    EXPECT_EQ(a->description(),
+              "Error Domain=POSIX Code=2 \"/private/var/mobile/x: No such file or directory\"");
     EXPECT_NE(a->identity(), b->identity());
     EXPECT_EQ(a->identity(), a->identity());
     EXPECT_EQ(makeError(-541478725, "Media", "End of file")->code(), -541478725);

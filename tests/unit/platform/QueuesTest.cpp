@@ -13,14 +13,12 @@ using namespace platform;
 using testing_support::waitUntil;
 
 namespace {
-QThread* mainThread()
-{
+QThread* mainThread() {
     return QCoreApplication::instance()->thread();
 }
 } // namespace
 
-TEST(MainQueue, AsyncFromAWorkerRunsOnTheMainThreadInOrder)
-{
+TEST(MainQueue, AsyncFromAWorkerRunsOnTheMainThreadInOrder) {
     std::vector<int> order;
     std::atomic<bool> allOnMain{true};
     GlobalQueue::async(QueuePriority::Default, [&] {
@@ -35,16 +33,14 @@ TEST(MainQueue, AsyncFromAWorkerRunsOnTheMainThreadInOrder)
     EXPECT_TRUE(allOnMain);
 }
 
-TEST(MainQueue, AsyncOnTheMainThreadNeverRunsInline)
-{
+TEST(MainQueue, AsyncOnTheMainThreadNeverRunsInline) {
     bool ran = false;
     MainQueue::async([&] { ran = true; });
     EXPECT_FALSE(ran);
     EXPECT_TRUE(waitUntil([&] { return ran; }));
 }
 
-TEST(MainQueue, SyncBlocksTheWorkerUntilTheMainThreadHasRunTheJob)
-{
+TEST(MainQueue, SyncBlocksTheWorkerUntilTheMainThreadHasRunTheJob) {
     std::atomic<bool> sawResult{false};
     std::atomic<bool> done{false};
     GlobalQueue::async(QueuePriority::Background, [&] {
@@ -64,14 +60,14 @@ TEST(MainQueue, SyncBlocksTheWorkerUntilTheMainThreadHasRunTheJob)
     EXPECT_TRUE(inline_);
 }
 
-TEST(GlobalQueue, JobsRunOnWorkersAndDrainWaitsForJobsThatQueueMore)
-{
+TEST(GlobalQueue, JobsRunOnWorkersAndDrainWaitsForJobsThatQueueMore) {
     std::atomic<int> ran{0};
     std::atomic<bool> anyOnMain{false};
     for (auto priority : {QueuePriority::Background, QueuePriority::Default}) {
         for (int i = 0; i < 8; ++i)
             GlobalQueue::async(priority, [&] {
-                anyOnMain = anyOnMain || QThread::currentThread() == mainThread() || !GlobalQueue::isWorkerThread();
+                anyOnMain = anyOnMain || QThread::currentThread() == mainThread() ||
+                            !GlobalQueue::isWorkerThread();
                 QThread::msleep(5);
                 GlobalQueue::async(QueuePriority::Background, [&] {
                     QThread::msleep(5);
@@ -85,10 +81,10 @@ TEST(GlobalQueue, JobsRunOnWorkersAndDrainWaitsForJobsThatQueueMore)
     EXPECT_FALSE(GlobalQueue::isWorkerThread());
 }
 
-TEST(GlobalQueue, DrainOnTheMainThreadLetsJobsWaitOnTheMainQueue)
-{
+TEST(GlobalQueue, DrainOnTheMainThreadLetsJobsWaitOnTheMainQueue) {
     std::atomic<bool> ranOnMain{false};
-    GlobalQueue::async(QueuePriority::Default, [&] { MainQueue::sync([&] { ranOnMain = MainQueue::isCurrent(); }); });
+    GlobalQueue::async(QueuePriority::Default,
+                       [&] { MainQueue::sync([&] { ranOnMain = MainQueue::isCurrent(); }); });
     GlobalQueue::drain();
     EXPECT_TRUE(ranOnMain);
 }

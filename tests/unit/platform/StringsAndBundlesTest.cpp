@@ -13,8 +13,7 @@
 using namespace platform;
 using testing_support::ScopedEnv;
 
-TEST(StringsTable, ReadsQuotedAndBareKeysCommentsAndEscapes)
-{
+TEST(StringsTable, ReadsQuotedAndBareKeysCommentsAndEscapes) {
     const auto table = parseStrings(QStringLiteral(R"(/* header
    spanning lines */
 "GREETING" = "Hello, \"%@\"!";   // trailing comment
@@ -30,16 +29,15 @@ BARE_KEY = "a\nb\tc\\d";
     EXPECT_EQ(table->size(), 4);
 }
 
-TEST(StringsTable, MalformedTablesAreRefusedWhole)
-{
-    for (const char* text : {R"("A" = "unterminated;)", R"("A" "B";)", R"("A" = "B")", R"("A" = ;)", "= \"x\";"})
+TEST(StringsTable, MalformedTablesAreRefusedWhole) {
+    for (const char* text :
+         {R"("A" = "unterminated;)", R"("A" "B";)", R"("A" = "B")", R"("A" = ;)", "= \"x\";"})
         EXPECT_FALSE(parseStrings(QString::fromUtf8(text))) << text;
     EXPECT_TRUE(parseStrings(""));
     EXPECT_FALSE(readStringsFile("/nonexistent/Localizable.strings"));
 }
 
-TEST(StringsTable, ReadsUtf16FilesWithAByteOrderMark)
-{
+TEST(StringsTable, ReadsUtf16FilesWithAByteOrderMark) {
     QTemporaryDir dir;
     QFile file(dir.filePath("t.strings"));
     ASSERT_TRUE(file.open(QIODevice::WriteOnly));
@@ -51,8 +49,7 @@ TEST(StringsTable, ReadsUtf16FilesWithAByteOrderMark)
     EXPECT_EQ(table->value("KEY").toString(), QStringLiteral("Grüße"));
 }
 
-TEST(PreferredLanguages, FollowGettextOrder)
-{
+TEST(PreferredLanguages, FollowGettextOrder) {
     ScopedEnv env;
     env.unset("LC_ALL");
     env.unset("LC_MESSAGES");
@@ -77,8 +74,7 @@ TEST(PreferredLanguages, FollowGettextOrder)
     EXPECT_TRUE(preferredLanguages().isEmpty());
 }
 
-TEST(Bundle, LooksUpTablesInPreferredLocalizationsThenEnglish)
-{
+TEST(Bundle, LooksUpTablesInPreferredLocalizationsThenEnglish) {
     QTemporaryDir dir;
     auto write = [&](const QString& rel, const QByteArray& text) {
         QDir().mkpath(QFileInfo(dir.filePath(rel)).absolutePath());
@@ -112,10 +108,10 @@ TEST(Bundle, LooksUpTablesInPreferredLocalizationsThenEnglish)
     EXPECT_TRUE(bundle->pathForResource("Localizable", "strings", "", "fr").isEmpty());
 }
 
-TEST(DesktopEntry, ReadsTheMainGroupWithLocalizedKeysAndEscapes)
-{
+TEST(DesktopEntry, ReadsTheMainGroupWithLocalizedKeysAndEscapes) {
     const auto entry = DesktopEntry::parse(QStringLiteral(
-        "# comment\n[Other]\nName=Wrong\n[Desktop Entry]\nName = Racer\\sDeluxe\nName[de_AT@euro]=Rennwagen\n"
+        "# comment\n[Other]\nName=Wrong\n[Desktop Entry]\nName = "
+        "Racer\\sDeluxe\nName[de_AT@euro]=Rennwagen\n"
         "Name[ja]=レーサー\nName=Duplicate\nComment=a\\nb\n[Desktop Action New]\nName=New\n"));
     ASSERT_TRUE(entry);
     EXPECT_EQ(entry->value("Name"), "Racer Deluxe");

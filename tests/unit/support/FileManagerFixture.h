@@ -12,24 +12,22 @@
 // A file manager on a scripted file system whose "/private/var/mobile/" is a
 // fresh temporary directory, with a clock the test sets.
 class FileManagerFixture : public ::testing::Test {
-protected:
-    FileManagerFixture()
-    {
+  protected:
+    FileManagerFixture() {
         root.makeLibrary();
         manager = FileManager::create(fileSystem, [this] { return now; });
     }
 
-    QString tempHost(const QString& name = QString()) const
-    {
-        return root.hostPath(QStringLiteral("Library/Tamsel") + (name.isEmpty() ? QString() : "/" + name));
+    QString tempHost(const QString& name = QString()) const {
+        return root.hostPath(QStringLiteral("Library/Tamsel") +
+                             (name.isEmpty() ? QString() : "/" + name));
     }
     QString tempDevice(const QString& name) const { return TXScreenRecorderTempDirectory + name; }
     QUrl tempUrl(const QString& name) const { return QUrl::fromLocalFile(tempDevice(name)); }
 
     // A file of `size` bytes in the temporary directory, last modified
     // `ageSeconds` before the fixture's clock.
-    void addFile(const QString& name, qint64 size, double ageSeconds = 0)
-    {
+    void addFile(const QString& name, qint64 size, double ageSeconds = 0) {
         testing_support::writeFile(tempHost(name), size);
         QFile file(tempHost(name));
         ASSERT_TRUE(file.open(QIODevice::ReadWrite));

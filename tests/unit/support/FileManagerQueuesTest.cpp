@@ -22,8 +22,7 @@ struct Outcome {
     std::atomic<bool> onWorker{false};
     ErrorPtr error;
 
-    FileManager::Completion completion()
-    {
+    FileManager::Completion completion() {
         return [this](ErrorPtr e) {
             error = std::move(e);
             onMainThread = QThread::currentThread() == QCoreApplication::instance()->thread();
@@ -31,19 +30,19 @@ struct Outcome {
             called = true;
         };
     }
-    bool wait() { return waitUntil([this] { return called.load(); }); }
+    bool wait() {
+        return waitUntil([this] { return called.load(); });
+    }
 };
 
-QByteArray contents(const QString& path)
-{
+QByteArray contents(const QString& path) {
     QFile file(path);
     return file.open(QIODevice::ReadOnly) ? file.readAll() : QByteArray();
 }
 
 } // namespace
 
-TEST_F(FileManagerFixture, RemovalCompletesOnAWorkerThread)
-{
+TEST_F(FileManagerFixture, RemovalCompletesOnAWorkerThread) {
     addFile("clip.mp4", 5);
     Outcome outcome;
     manager->_srRemoveFile_completion(tempUrl("clip.mp4"), outcome.completion());
@@ -55,8 +54,7 @@ TEST_F(FileManagerFixture, RemovalCompletesOnAWorkerThread)
     EXPECT_TRUE(logs.texts().isEmpty());
 }
 
-TEST_F(FileManagerFixture, RemovingNothingIsNotAnError)
-{
+TEST_F(FileManagerFixture, RemovingNothingIsNotAnError) {
     Outcome outcome;
     manager->_srRemoveFile_completion(tempUrl("never-there.mp4"), outcome.completion());
     ASSERT_TRUE(outcome.wait());
@@ -71,8 +69,7 @@ TEST_F(FileManagerFixture, RemovingNothingIsNotAnError)
     EXPECT_FALSE(exists("quiet.mp4"));
 }
 
-TEST_F(FileManagerFixture, FailedRemovalLogsItsCodeAtDefaultLevel)
-{
+TEST_F(FileManagerFixture, FailedRemovalLogsItsCodeAtDefaultLevel) {
     addFile("locked.mp4", 5);
     fileSystem->failRemovalOf("locked.mp4", 13);
     Outcome outcome;
@@ -80,11 +77,11 @@ TEST_F(FileManagerFixture, FailedRemovalLogsItsCodeAtDefaultLevel)
     ASSERT_TRUE(outcome.wait());
     ASSERT_TRUE(outcome.error);
     EXPECT_EQ(outcome.error->code(), 13);
-    EXPECT_EQ(logs.lines(), (QList<testing_support::LogLine>{{LogLevel::Default, "_tqRemoveFile error: 13"}}));
+    EXPECT_EQ(logs.lines(),
+              (QList<testing_support::LogLine>{{LogLevel::Default, "_tqRemoveFile error: 13"}}));
 }
 
-TEST_F(FileManagerFixture, AQueuedJobKeepsItsFileManagerAlive)
-{
+TEST_F(FileManagerFixture, AQueuedJobKeepsItsFileManagerAlive) {
     addFile("clip.mp4", 5);
     std::weak_ptr<FileManager> weak = manager;
     std::atomic<bool> aliveInCompletion{false};
@@ -100,12 +97,12 @@ TEST_F(FileManagerFixture, AQueuedJobKeepsItsFileManagerAlive)
     EXPECT_TRUE(waitUntil([&] { return weak.expired(); }));
 }
 
-TEST_F(FileManagerFixture, MoveReplacesTheDestination)
-{
+TEST_F(FileManagerFixture, MoveReplacesTheDestination) {
     testing_support::writeFile(tempHost("new.mp4"), 3);
     testing_support::writeFile(tempHost("old.mp4"), 9);
     Outcome outcome;
-    manager->_srMoveFileFromURL_toURL_completion(tempUrl("new.mp4"), tempUrl("old.mp4"), outcome.completion());
+    manager->_srMoveFileFromURL_toURL_completion(tempUrl("new.mp4"), tempUrl("old.mp4"),
+                                                 outcome.completion());
     ASSERT_TRUE(outcome.wait());
     EXPECT_FALSE(outcome.error);
     EXPECT_FALSE(outcome.onMainThread);
@@ -114,22 +111,23 @@ TEST_F(FileManagerFixture, MoveReplacesTheDestination)
     EXPECT_TRUE(logs.texts().isEmpty());
 }
 
-TEST_F(FileManagerFixture, MoveOfAMissingSourceReportsAndLogsTheErrorIdentity)
-{
+TEST_F(FileManagerFixture, MoveOfAMissingSourceReportsAndLogsTheErrorIdentity) {
     testing_support::writeFile(tempHost("kept.mp4"), 4);
     Outcome outcome;
-    manager->_srMoveFileFromURL_toURL_completion(tempUrl("gone.mp4"), tempUrl("other.mp4"), outcome.completion());
+    manager->_srMoveFileFromURL_toURL_completion(tempUrl("gone.mp4"), tempUrl("other.mp4"),
+                                                 outcome.completion());
     ASSERT_TRUE(outcome.wait());
     ASSERT_TRUE(outcome.error);
     EXPECT_EQ(outcome.error->code(), 2);
-    EXPECT_EQ(logs.lines(), (QList<testing_support::LogLine>{
-                                {LogLevel::Error, QStringLiteral("_tqMoveFileFromURL error: %1")
-                                                      .arg(outcome.error->identity())}}));
+    EXPECT_EQ(
+        logs.lines(),
+        (QList<testing_support::LogLine>{
+            {LogLevel::Error,
+             QStringLiteral("_tqMoveFileFromURL error: %1").arg(outcome.error->identity())}}));
     EXPECT_TRUE(exists("kept.mp4"));
 }
 
-TEST_F(FileManagerFixture, DeletionByPrefixIgnoresCaseAndAccents)
-{
+TEST_F(FileManagerFixture, DeletionByPrefixIgnoresCaseAndAccents) {
     for (const char* name : {"abc.mp4", "ABC_1.mp4", "ábc.mov", "Ábc 2.mov", "xabc.mp4", "ab.mp4"})
         addFile(QString::fromUtf8(name), 1);
     // The same letters written decomposed, as some file systems store them.
@@ -144,8 +142,7 @@ TEST_F(FileManagerFixture, DeletionByPrefixIgnoresCaseAndAccents)
     EXPECT_TRUE(logs.texts().isEmpty());
 }
 
-TEST_F(FileManagerFixture, DeletionByPrefixLogsACarriedErrorBeforeEachLaterEntry)
-{
+TEST_F(FileManagerFixture, DeletionByPrefixLogsACarriedErrorBeforeEachLaterEntry) {
     for (const char* name : {"abc1", "abc2", "abc3"})
         addFile(name, 1);
     fileSystem->failRemovalOf("abc1");
@@ -161,8 +158,7 @@ TEST_F(FileManagerFixture, DeletionByPrefixLogsACarriedErrorBeforeEachLaterEntry
     EXPECT_FALSE(exists("abc3"));
 }
 
-TEST_F(FileManagerFixture, DeletionByPrefixNeverLogsAFailureOfTheLastEntry)
-{
+TEST_F(FileManagerFixture, DeletionByPrefixNeverLogsAFailureOfTheLastEntry) {
     for (const char* name : {"abc1", "abc2"})
         addFile(name, 1);
     fileSystem->failRemovalOf("abc2");
@@ -172,8 +168,7 @@ TEST_F(FileManagerFixture, DeletionByPrefixNeverLogsAFailureOfTheLastEntry)
     EXPECT_TRUE(exists("abc2"));
 }
 
-TEST(FileManagerMissingDirectory, DeletionByPrefixDoesNothingQuietly)
-{
+TEST(FileManagerMissingDirectory, DeletionByPrefixDoesNothingQuietly) {
     testing_support::MobileRoot root;
     testing_support::LogCapture logs;
     FileManager::create(platform::FileSystem::local())->_srDeleteFilesWithPrefix("abc");

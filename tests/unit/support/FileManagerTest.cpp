@@ -11,19 +11,17 @@
 using platform::LogLevel;
 
 namespace {
-const QString kPurgeError =
-    QStringLiteral("error in _tqRemoveFile_srDeleteFilesOlderThanTimeToLiveInSeconds, error code: %1");
+const QString kPurgeError = QStringLiteral(
+    "error in _tqRemoveFile_srDeleteFilesOlderThanTimeToLiveInSeconds, error code: %1");
 }
 
-TEST_F(FileManagerFixture, TempPathIsTheExportedDirectory)
-{
+TEST_F(FileManagerFixture, TempPathIsTheExportedDirectory) {
     EXPECT_EQ(manager->_srTempPath(), QStringLiteral("/private/var/mobile/Library/Tamsel/"));
     EXPECT_EQ(manager->_srTempPath(), TXScreenRecorderTempDirectory);
     EXPECT_EQ(TXScreenRecorderRequiredFreeSpace, 100000000u);
 }
 
-TEST(FileManagerSetup, CreatesTheDirectoryAndLeavesAnythingAlreadyThere)
-{
+TEST(FileManagerSetup, CreatesTheDirectoryAndLeavesAnythingAlreadyThere) {
     testing_support::MobileRoot root;
     root.makeLibrary(false);
     testing_support::LogCapture logs;
@@ -32,9 +30,9 @@ TEST(FileManagerSetup, CreatesTheDirectoryAndLeavesAnythingAlreadyThere)
     manager->_srSetupTempDirectory();
     EXPECT_TRUE(QFileInfo(root.hostPath("Library/Tamsel")).isDir());
     manager->_srSetupTempDirectory();
-    EXPECT_EQ(logs.lines(), (QList<testing_support::LogLine>{
-                                {LogLevel::Default, "_srSetupTempDirectory"},
-                                {LogLevel::Default, "_srSetupTempDirectory"}}));
+    EXPECT_EQ(logs.lines(),
+              (QList<testing_support::LogLine>{{LogLevel::Default, "_srSetupTempDirectory"},
+                                               {LogLevel::Default, "_srSetupTempDirectory"}}));
 
     // A plain file of that name is not replaced.
     QDir(root.hostPath("Library/Tamsel")).removeRecursively();
@@ -44,8 +42,7 @@ TEST(FileManagerSetup, CreatesTheDirectoryAndLeavesAnythingAlreadyThere)
     EXPECT_EQ(logs.texts().count(), 3) << logs.texts().join(" | ").toStdString();
 }
 
-TEST(FileManagerSetup, FailureGoesToTheConsoleAndThenTheErrorLog)
-{
+TEST(FileManagerSetup, FailureGoesToTheConsoleAndThenTheErrorLog) {
     testing_support::MobileRoot root; // no Library folder: parents are never created
     testing_support::LogCapture logs;
     FileManager::create(platform::FileSystem::local())->_srSetupTempDirectory();
@@ -54,14 +51,16 @@ TEST(FileManagerSetup, FailureGoesToTheConsoleAndThenTheErrorLog)
     ASSERT_EQ(lines.size(), 3);
     EXPECT_EQ(lines[0], (testing_support::LogLine{LogLevel::Default, "_srSetupTempDirectory"}));
     EXPECT_EQ(lines[1].level, LogLevel::Console);
-    EXPECT_TRUE(lines[1].text.startsWith("error: Error Domain=POSIX Code=2 ")) << lines[1].text.toStdString();
-    EXPECT_TRUE(lines[1].text.contains("/private/var/mobile/Library/Tamsel/")) << "logs speak of device paths";
-    EXPECT_EQ(lines[2], (testing_support::LogLine{LogLevel::Error, "error creating temp directory"}));
+    EXPECT_TRUE(lines[1].text.startsWith("error: Error Domain=POSIX Code=2 "))
+        << lines[1].text.toStdString();
+    EXPECT_TRUE(lines[1].text.contains("/private/var/mobile/Library/Tamsel/"))
+        << "logs speak of device paths";
+    EXPECT_EQ(lines[2],
+              (testing_support::LogLine{LogLevel::Error, "error creating temp directory"}));
     EXPECT_FALSE(QFileInfo::exists(root.hostPath("Library")));
 }
 
-TEST_F(FileManagerFixture, PurgeRemovesOnlyEntriesOlderThanTheTimeToLive)
-{
+TEST_F(FileManagerFixture, PurgeRemovesOnlyEntriesOlderThanTheTimeToLive) {
     addFile("old.mp4", 1000, 200);
     addFile("exactly.mp4", 2000, 100);
     addFile("young.mp4", 4000, 50);
@@ -71,11 +70,11 @@ TEST_F(FileManagerFixture, PurgeRemovesOnlyEntriesOlderThanTheTimeToLive)
     EXPECT_FALSE(exists("old.mp4"));
     EXPECT_TRUE(exists("exactly.mp4")) << "an age equal to the time to live is kept";
     EXPECT_TRUE(exists("young.mp4"));
-    EXPECT_EQ(logs.texts(), (QStringList{"_srDeleteFilesOlderThanTimeToLiveInSeconds: 100", "deleting old file"}));
+    EXPECT_EQ(logs.texts(), (QStringList{"_srDeleteFilesOlderThanTimeToLiveInSeconds: 100",
+                                         "deleting old file"}));
 }
 
-TEST_F(FileManagerFixture, ZeroAndNegativeTimeToLiveRemoveEverythingAndNaNNothing)
-{
+TEST_F(FileManagerFixture, ZeroAndNegativeTimeToLiveRemoveEverythingAndNaNNothing) {
     struct Case {
         double timeToLive;
         qint64 removed;
@@ -102,8 +101,7 @@ TEST_F(FileManagerFixture, ZeroAndNegativeTimeToLiveRemoveEverythingAndNaNNothin
     }
 }
 
-TEST_F(FileManagerFixture, DeleteAllTempFilesIsThePurgeWithZeroTimeToLive)
-{
+TEST_F(FileManagerFixture, DeleteAllTempFilesIsThePurgeWithZeroTimeToLive) {
     addFile("a.mp4", 7, 0);
     QDir().mkpath(tempHost("folder/inner")); // entries are treated alike, folders too
     EXPECT_GE(manager->_srDeleteAllTempFiles(), 7);
@@ -111,16 +109,15 @@ TEST_F(FileManagerFixture, DeleteAllTempFilesIsThePurgeWithZeroTimeToLive)
     EXPECT_EQ(logs.texts().first(), "_srDeleteFilesOlderThanTimeToLiveInSeconds: 0");
 }
 
-TEST_F(FileManagerFixture, PurgeTimeToLiveIsLoggedClampedTo32Bits)
-{
+TEST_F(FileManagerFixture, PurgeTimeToLiveIsLoggedClampedTo32Bits) {
     manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(1e12);
     manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(-1e12);
-    EXPECT_EQ(logs.texts(), (QStringList{"_srDeleteFilesOlderThanTimeToLiveInSeconds: 2147483647",
-                                         "_srDeleteFilesOlderThanTimeToLiveInSeconds: -2147483648"}));
+    EXPECT_EQ(logs.texts(),
+              (QStringList{"_srDeleteFilesOlderThanTimeToLiveInSeconds: 2147483647",
+                           "_srDeleteFilesOlderThanTimeToLiveInSeconds: -2147483648"}));
 }
 
-TEST_F(FileManagerFixture, PurgeCarriesTheFirstFailureToTheEnd)
-{
+TEST_F(FileManagerFixture, PurgeCarriesTheFirstFailureToTheEnd) {
     addFile("a.mp4", 10, 500);
     addFile("b.mp4", 20, 500);
     addFile("c.mp4", 40, 500);
@@ -139,8 +136,7 @@ TEST_F(FileManagerFixture, PurgeCarriesTheFirstFailureToTheEnd)
     EXPECT_TRUE(console[0].text.contains("Code=13"));
 }
 
-TEST_F(FileManagerFixture, UnreadableAttributesKeepTheEntryButPoisonTheTotal)
-{
+TEST_F(FileManagerFixture, UnreadableAttributesKeepTheEntryButPoisonTheTotal) {
     addFile("a.mp4", 10, 500);
     addFile("b.mp4", 20, 500);
     fileSystem->failAttributesOf("a.mp4");
@@ -151,8 +147,7 @@ TEST_F(FileManagerFixture, UnreadableAttributesKeepTheEntryButPoisonTheTotal)
     EXPECT_EQ(logs.count(LogLevel::Error, kPurgeError.arg(5)), 3);
 }
 
-TEST(FileManagerMissingDirectory, PurgeReportsOnceAndRemovesNothing)
-{
+TEST(FileManagerMissingDirectory, PurgeReportsOnceAndRemovesNothing) {
     testing_support::MobileRoot root;
     testing_support::LogCapture logs;
     auto manager = FileManager::create(platform::FileSystem::local());
@@ -171,18 +166,19 @@ TEST(FileManagerMissingDirectory, PurgeReportsOnceAndRemovesNothing)
     EXPECT_FALSE(manager->_srDeviceHasSufficientFreeSpaceForRecording());
 }
 
-TEST_F(FileManagerFixture, SizeOfTempDirIsTheDirectoryEntryNotItsContents)
-{
+TEST_F(FileManagerFixture, SizeOfTempDirIsTheDirectoryEntryNotItsContents) {
     addFile("big.mp4", 1 << 20);
     platform::ErrorPtr error;
     const std::int64_t size = manager->_srSizeOfTempDir(&error);
     EXPECT_FALSE(error);
-    EXPECT_EQ(size, std::int64_t(fileSystem->attributesOfItemAtPath(TXScreenRecorderTempDirectory, nullptr)->size));
+    EXPECT_EQ(
+        size,
+        std::int64_t(
+            fileSystem->attributesOfItemAtPath(TXScreenRecorderTempDirectory, nullptr)->size));
     EXPECT_LT(size, 1 << 20);
 }
 
-TEST_F(FileManagerFixture, CreationDateOfAFileOrNone)
-{
+TEST_F(FileManagerFixture, CreationDateOfAFileOrNone) {
     addFile("clip.mp4", 1);
     const QDateTime created = manager->_srGetCreationDateForFile(tempUrl("clip.mp4"));
     ASSERT_TRUE(created.isValid());
@@ -191,8 +187,7 @@ TEST_F(FileManagerFixture, CreationDateOfAFileOrNone)
     EXPECT_TRUE(logs.texts().isEmpty());
 }
 
-TEST_F(FileManagerFixture, FreeSpaceIsRead32BitsWideAndMustExceedTheRequirement)
-{
+TEST_F(FileManagerFixture, FreeSpaceIsRead32BitsWideAndMustExceedTheRequirement) {
     struct Case {
         std::uint64_t reported;
         std::uint64_t read;
@@ -200,10 +195,8 @@ TEST_F(FileManagerFixture, FreeSpaceIsRead32BitsWideAndMustExceedTheRequirement)
     };
     const std::uint64_t fourGiB = std::uint64_t(1) << 32;
     const Case cases[] = {
-        {100000000, 100000000, false},
-        {100000001, 100000001, true},
-        {fourGiB + 10, 10, false},
-        {fourGiB + 100000001, 100000001, true},
+        {100000000, 100000000, false},    {100000001, 100000001, true},
+        {fourGiB + 10, 10, false},        {fourGiB + 100000001, 100000001, true},
         {fourGiB - 1, fourGiB - 1, true},
     };
     for (const Case& c : cases) {

@@ -19,8 +19,7 @@ namespace {
 
 // Sets the user's language environment for one test.
 struct Languages : ScopedEnv {
-    explicit Languages(const char* lang, const char* language = nullptr)
-    {
+    explicit Languages(const char* lang, const char* language = nullptr) {
         unset("LC_ALL");
         unset("LC_MESSAGES");
         set("LANG", lang);
@@ -31,13 +30,12 @@ struct Languages : ScopedEnv {
     }
 };
 
-QString localized(const QString& key)
-{
-    return BundleTXExtensions::_txLocalizedStringFromFrameworkBundleWithKey_bundleID(key, "org.example.Racer");
+QString localized(const QString& key) {
+    return BundleTXExtensions::_txLocalizedStringFromFrameworkBundleWithKey_bundleID(
+        key, "org.example.Racer");
 }
 
-void writeText(const QString& path, const QByteArray& text)
-{
+void writeText(const QString& path, const QByteArray& text) {
     QDir().mkpath(QFileInfo(path).absolutePath());
     QFile file(path);
     ASSERT_TRUE(file.open(QIODevice::WriteOnly));
@@ -46,17 +44,16 @@ void writeText(const QString& path, const QByteArray& text)
 
 } // namespace
 
-TEST(FrameworkStrings, ARegionFallsBackToItsPlainLanguage)
-{
+TEST(FrameworkStrings, ARegionFallsBackToItsPlainLanguage) {
     Languages env("de_AT.UTF-8");
     EXPECT_EQ(localized("DONE"), QStringLiteral("Fertig"));
-    EXPECT_EQ(BundleTXExtensions::_txLocalizedStringFromFrameworkBundleWithKey_bundleID("DONE", "any.other.id"),
+    EXPECT_EQ(BundleTXExtensions::_txLocalizedStringFromFrameworkBundleWithKey_bundleID(
+                  "DONE", "any.other.id"),
               QStringLiteral("Fertig"))
         << "the bundle identifier does not change the text";
 }
 
-TEST(FrameworkStrings, WithoutLanguagesOrAMatchTheFrameworksOwnLookupDecides)
-{
+TEST(FrameworkStrings, WithoutLanguagesOrAMatchTheFrameworksOwnLookupDecides) {
     {
         Languages env("C");
         EXPECT_EQ(localized("SAVE"), QStringLiteral("Save"));
@@ -74,8 +71,7 @@ TEST(FrameworkStrings, WithoutLanguagesOrAMatchTheFrameworksOwnLookupDecides)
     }
 }
 
-TEST(FrameworkStrings, EveryShippedLanguageHasEveryKey)
-{
+TEST(FrameworkStrings, EveryShippedLanguageHasEveryKey) {
     const auto english = BundleTXExtensions::localizedDictionaryForLanguage("en");
     ASSERT_TRUE(english);
     for (const char* key : {"SHARE_TEXT_FORMAT", "DONE", "CANCEL", "SAVE"})
@@ -94,53 +90,60 @@ TEST(FrameworkStrings, EveryShippedLanguageHasEveryKey)
     ASSERT_TRUE(photos);
     for (const char* language : {"en", "de", "fr", "es", "ja"}) {
         Languages env((QByteArray(language) + "_XX.UTF-8").constData());
-        for (const char* key : {"PUBLISHED_VIDEO", "VIEW_BUTTON_TITLE_FORMAT", "FAILED_PUBLISH_VIDEO", "CLOSE"})
-            EXPECT_NE(TXLocalizedFrameworkString(key), QString::fromLatin1(key)) << language << " " << key;
+        for (const char* key :
+             {"PUBLISHED_VIDEO", "VIEW_BUTTON_TITLE_FORMAT", "FAILED_PUBLISH_VIDEO", "CLOSE"})
+            EXPECT_NE(TXLocalizedFrameworkString(key), QString::fromLatin1(key))
+                << language << " " << key;
     }
 }
 
-TEST(FrameworkStrings, PhotoFrameworkTablesAreSearchedInOrder)
-{
+TEST(FrameworkStrings, PhotoFrameworkTablesAreSearchedInOrder) {
     Languages env("de_DE.UTF-8");
     EXPECT_EQ(TXLocalizedFrameworkString("CLOSE"), QStringLiteral("Schließen"));
     // Found only in the last table.
-    EXPECT_EQ(TXLocalizedFrameworkString("VIEW_BUTTON_TITLE_FORMAT"), QStringLiteral("Auf %@ ansehen"));
+    EXPECT_EQ(TXLocalizedFrameworkString("VIEW_BUTTON_TITLE_FORMAT"),
+              QStringLiteral("Auf %@ ansehen"));
     EXPECT_EQ(TXLocalizedFrameworkString("NOT_A_KEY"), QStringLiteral("NOT_A_KEY"));
     EXPECT_EQ(TXQuillonFrameworkBundle(), TXQuillonFrameworkBundle());
     EXPECT_EQ(BundleTXExtensions::_txFrameworkBundle(), BundleTXExtensions::_txFrameworkBundle());
 }
 
-TEST(AppNames, DisplayNameComesFromTheInstalledDesktopEntryInTheUsersLanguage)
-{
+TEST(AppNames, DisplayNameComesFromTheInstalledDesktopEntryInTheUsersLanguage) {
     QTemporaryDir home, dirs;
     ScopedEnv env("XDG_DATA_HOME", home.path().toLocal8Bit());
     env.set("XDG_DATA_DIRS", dirs.path().toLocal8Bit());
-    writeText(home.path() + "/applications/org.example.Racer.desktop",
-              "[Desktop Entry]\nType=Application\nName=Racer\nName[de]=Rennwagen\nName[fr_CA]=Bolide\n");
-    writeText(dirs.path() + "/applications/org.example.Nameless.desktop", "[Desktop Entry]\nType=Application\n");
+    writeText(
+        home.path() + "/applications/org.example.Racer.desktop",
+        "[Desktop Entry]\nType=Application\nName=Racer\nName[de]=Rennwagen\nName[fr_CA]=Bolide\n");
+    writeText(dirs.path() + "/applications/org.example.Nameless.desktop",
+              "[Desktop Entry]\nType=Application\n");
 
     {
         Languages lang("de_AT.UTF-8");
-        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"), QStringLiteral("Rennwagen"));
+        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"),
+                  QStringLiteral("Rennwagen"));
     }
     {
         Languages lang("fr_CA.UTF-8");
-        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"), QStringLiteral("Bolide"));
+        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"),
+                  QStringLiteral("Bolide"));
     }
     {
         Languages lang("es_ES.UTF-8");
-        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"), QStringLiteral("Racer"));
+        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"),
+                  QStringLiteral("Racer"));
     }
-    const auto nameless = BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Nameless");
+    const auto nameless =
+        BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Nameless");
     ASSERT_TRUE(nameless);
     EXPECT_TRUE(nameless->isEmpty());
     EXPECT_FALSE(nameless->isNull());
     EXPECT_FALSE(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Missing"));
-    EXPECT_FALSE(BundleTXExtensions::_txLocalizedAppNameFromBundleID("../applications/org.example.Racer"));
+    EXPECT_FALSE(
+        BundleTXExtensions::_txLocalizedAppNameFromBundleID("../applications/org.example.Racer"));
 }
 
-TEST(AppNames, BundleNameEntriesAreTriedInOrder)
-{
+TEST(AppNames, BundleNameEntriesAreTriedInOrder) {
     QTemporaryDir dir;
     const QString plain = dir.path() + "/Plain.bundle";
     QDir().mkpath(plain);
@@ -166,18 +169,20 @@ TEST(AppNames, BundleNameEntriesAreTriedInOrder)
               QStringLiteral("Short"));
 }
 
-TEST(DateLine, IsLocalTimeWithTwelveHourClock)
-{
+TEST(DateLine, IsLocalTimeWithTwelveHourClock) {
     QLocale::setDefault(QLocale(QLocale::English, QLocale::UnitedStates));
     ScopedEnv env("TZ", "Asia/Tokyo");
     tzset();
 
-    EXPECT_EQ(DateTXExtensions::_srGetStringFromDate(QDateTime(QDate(2016, 3, 5), QTime(14, 7), Qt::LocalTime)),
+    EXPECT_EQ(DateTXExtensions::_srGetStringFromDate(
+                  QDateTime(QDate(2016, 3, 5), QTime(14, 7), Qt::LocalTime)),
               QStringLiteral("March 5 02:07 PM"));
     // The same instant given in UTC still reads as the device's local time.
-    EXPECT_EQ(DateTXExtensions::_srGetStringFromDate(QDateTime(QDate(2016, 3, 5), QTime(5, 7), Qt::UTC)),
-              QStringLiteral("March 5 02:07 PM"));
-    EXPECT_EQ(DateTXExtensions::_srGetStringFromDate(QDateTime(QDate(2016, 11, 21), QTime(0, 5), Qt::LocalTime)),
+    EXPECT_EQ(
+        DateTXExtensions::_srGetStringFromDate(QDateTime(QDate(2016, 3, 5), QTime(5, 7), Qt::UTC)),
+        QStringLiteral("March 5 02:07 PM"));
+    EXPECT_EQ(DateTXExtensions::_srGetStringFromDate(
+                  QDateTime(QDate(2016, 11, 21), QTime(0, 5), Qt::LocalTime)),
               QStringLiteral("November 21 12:05 AM"));
 
     QLocale::setDefault(QLocale::c());

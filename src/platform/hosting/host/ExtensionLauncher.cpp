@@ -13,17 +13,16 @@ namespace {
 constexpr int kChildDescriptor = 3;
 } // namespace
 
-ExtensionLauncher::ExtensionLauncher(QObject* parent) : QObject(parent)
-{
-    connect(&process_, &QProcess::finished, this, [this](int exitCode, QProcess::ExitStatus status) {
-        if (channel_)
-            channel_->close();
-        emit extensionEnded(exitCode, status != QProcess::NormalExit || exitCode != 0);
-    });
+ExtensionLauncher::ExtensionLauncher(QObject* parent) : QObject(parent) {
+    connect(&process_, &QProcess::finished, this,
+            [this](int exitCode, QProcess::ExitStatus status) {
+                if (channel_)
+                    channel_->close();
+                emit extensionEnded(exitCode, status != QProcess::NormalExit || exitCode != 0);
+            });
 }
 
-ExtensionLauncher::~ExtensionLauncher()
-{
+ExtensionLauncher::~ExtensionLauncher() {
     if (process_.state() != QProcess::NotRunning) {
         process_.kill();
         process_.waitForFinished(2000);
@@ -31,8 +30,7 @@ ExtensionLauncher::~ExtensionLauncher()
 }
 
 bool ExtensionLauncher::start(const QString& program, const QStringList& arguments,
-                              const QList<ExtensionItem>& inputItems, QString* error)
-{
+                              const QList<ExtensionItem>& inputItems, QString* error) {
     const auto [hostEnd, extensionEnd] = makeSocketPair();
     if (hostEnd < 0) {
         if (error)
@@ -43,10 +41,12 @@ bool ExtensionLauncher::start(const QString& program, const QStringList& argumen
     channel_->onMessage = [this](const QCborMap& message) {
         if (message.value(QStringLiteral("type")).toString() != HostMessages::Invoke)
             return;
-        if (message.value(QStringLiteral("selector")).toString() != QLatin1String("extensionDidFinishWithActivityTypes:"))
+        if (message.value(QStringLiteral("selector")).toString() !=
+            QLatin1String("extensionDidFinishWithActivityTypes:"))
             return;
         QStringList types;
-        for (const QCborValue& type : message.value(QStringLiteral("arguments")).toArray().at(0).toArray())
+        for (const QCborValue& type :
+             message.value(QStringLiteral("arguments")).toArray().at(0).toArray())
             if (type.isString())
                 types.append(type.toString());
         emit extensionDidFinishWithActivityTypes(types);
@@ -55,7 +55,8 @@ bool ExtensionLauncher::start(const QString& program, const QStringList& argumen
     QProcessEnvironment environment = process_.processEnvironment().isEmpty()
                                           ? QProcessEnvironment::systemEnvironment()
                                           : process_.processEnvironment();
-    environment.insert(QString::fromLatin1(HostMessages::HostDescriptorVariable), QString::number(kChildDescriptor));
+    environment.insert(QString::fromLatin1(HostMessages::HostDescriptorVariable),
+                       QString::number(kChildDescriptor));
     process_.setProcessEnvironment(environment);
     const int childEnd = extensionEnd;
     // Runs in the child between fork and exec: only async-signal-safe calls.
@@ -75,8 +76,7 @@ bool ExtensionLauncher::start(const QString& program, const QStringList& argumen
     return true;
 }
 
-void ExtensionLauncher::dismiss(int graceMs)
-{
+void ExtensionLauncher::dismiss(int graceMs) {
     if (channel_)
         channel_->send(QCborMap{{QStringLiteral("type"), HostMessages::Dismiss}});
     if (process_.state() == QProcess::NotRunning)
@@ -87,8 +87,7 @@ void ExtensionLauncher::dismiss(int graceMs)
     });
 }
 
-bool ExtensionLauncher::isRunning() const
-{
+bool ExtensionLauncher::isRunning() const {
     return process_.state() != QProcess::NotRunning;
 }
 

@@ -17,14 +17,14 @@ class MessageChannel;
 // thread's event loop); its signals are emitted there.
 class ExtensionLauncher : public QObject {
     Q_OBJECT
-public:
+  public:
     explicit ExtensionLauncher(QObject* parent = nullptr);
     ~ExtensionLauncher() override;
 
     // Starts `program` with `arguments` and sends the request. False, with
     // `error` set, when the process cannot be started.
-    bool start(const QString& program, const QStringList& arguments, const QList<ExtensionItem>& inputItems,
-               QString* error = nullptr);
+    bool start(const QString& program, const QStringList& arguments,
+               const QList<ExtensionItem>& inputItems, QString* error = nullptr);
 
     // The host closes the extension: it is asked to end, and killed when it
     // has not ended within `graceMs`.
@@ -33,14 +33,14 @@ public:
     bool isRunning() const;
     QProcess& process() { return process_; }
 
-signals:
+  signals:
     // The extension's extensionDidFinishWithActivityTypes: message.
     void extensionDidFinishWithActivityTypes(const QStringList& activityTypes);
     // The extension process has ended: `crashed` when it died of a signal or
     // ended with a non-zero status.
     void extensionEnded(int exitCode, bool crashed);
 
-private:
+  private:
     QProcess process_;
     std::shared_ptr<MessageChannel> channel_;
 };

@@ -23,15 +23,14 @@ std::mutex lastSavedMutex;
 
 const QString kDomain = QStringLiteral("PhotoAlbum");
 
-ErrorPtr albumError(PhotoAlbum::ErrorCode code, const QString& message)
-{
+ErrorPtr albumError(PhotoAlbum::ErrorCode code, const QString& message) {
     return makeError(code, kDomain, message);
 }
 
-ErrorPtr errorForErrno(int err, const QString& what)
-{
+ErrorPtr errorForErrno(int err, const QString& what) {
     if (err == ENOSPC || err == EFBIG || err == EDQUOT)
-        return albumError(PhotoAlbum::DiskFull, QStringLiteral("not enough space for %1").arg(what));
+        return albumError(PhotoAlbum::DiskFull,
+                          QStringLiteral("not enough space for %1").arg(what));
     return albumError(PhotoAlbum::NotWritable,
                       QStringLiteral("%1: %2").arg(what, QString::fromLocal8Bit(strerror(err))));
 }
@@ -39,16 +38,14 @@ ErrorPtr errorForErrno(int err, const QString& what)
 // Closes a descriptor when it goes out of scope.
 struct Descriptor {
     int fd = -1;
-    ~Descriptor()
-    {
+    ~Descriptor() {
         if (fd >= 0)
             ::close(fd);
     }
 };
 
 // Copies everything from `in` to `out`, in the kernel where it can.
-int copyContents(int in, int out)
-{
+int copyContents(int in, int out) {
     for (;;) {
         const ssize_t n = ::copy_file_range(in, nullptr, out, nullptr, 1 << 30, 0);
         if (n == 0)
@@ -84,18 +81,17 @@ int copyContents(int in, int out)
 }
 
 // "clip.mp4", "clip 2.mp4", "clip 3.mp4" ...
-QString candidateName(const QFileInfo& source, int attempt)
-{
+QString candidateName(const QFileInfo& source, int attempt) {
     if (attempt == 1)
         return source.fileName();
-    const QString suffix = source.suffix().isEmpty() ? QString() : QLatin1Char('.') + source.suffix();
+    const QString suffix =
+        source.suffix().isEmpty() ? QString() : QLatin1Char('.') + source.suffix();
     return QStringLiteral("%1 %2%3").arg(source.completeBaseName()).arg(attempt).arg(suffix);
 }
 
 } // namespace
 
-std::shared_ptr<PhotoAlbum> PhotoAlbum::sharedAlbum()
-{
+std::shared_ptr<PhotoAlbum> PhotoAlbum::sharedAlbum() {
     QString folder = qEnvironmentVariable("TAMSEL_ALBUM_DIR");
     if (folder.isEmpty()) {
         QString videos = QStandardPaths::writableLocation(QStandardPaths::MoviesLocation);
@@ -108,18 +104,17 @@ std::shared_ptr<PhotoAlbum> PhotoAlbum::sharedAlbum()
 
 PhotoAlbum::PhotoAlbum(QString folderHostPath) : folder_(std::move(folderHostPath)) {}
 
-QString PhotoAlbum::lastSavedPath() const
-{
+QString PhotoAlbum::lastSavedPath() const {
     std::lock_guard lock(lastSavedMutex);
     return *lastSaved_;
 }
 
-QString PhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error)
-{
+QString PhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error) {
     const QString source = DevicePaths::toHost(devicePath);
     const auto asset = Asset::assetWithURL(QUrl::fromLocalFile(source));
     if (asset->tracksWithMediaType(MediaType::Video).isEmpty() || !asset->isPlayable()) {
-        setError(error, albumError(NotVideo, QStringLiteral("%1 is not a playable video").arg(devicePath)));
+        setError(error, albumError(NotVideo,
+                                   QStringLiteral("%1 is not a playable video").arg(devicePath)));
         return {};
     }
     if (!QDir().mkpath(folder_) || !QFileInfo(folder_).isDir()) {
@@ -155,8 +150,7 @@ QString PhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error)
     }
     struct Cleanup {
         QByteArray path;
-        ~Cleanup()
-        {
+        ~Cleanup() {
             if (!path.isEmpty())
                 ::unlink(path.constData());
         }
@@ -170,11 +164,13 @@ QString PhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error)
 
     const QFileInfo sourceInfo(source);
     const QByteArray procPath =
-        hiddenName.isEmpty() ? QByteArrayLiteral("/proc/self/fd/") + QByteArray::number(out.fd) : hiddenName;
+        hiddenName.isEmpty() ? QByteArrayLiteral("/proc/self/fd/") + QByteArray::number(out.fd)
+                             : hiddenName;
     for (int attempt = 1; attempt < 10000; ++attempt) {
         const QString name = candidateName(sourceInfo, attempt);
         // linkat never replaces: a name that is taken fails with EEXIST.
-        if (::linkat(AT_FDCWD, procPath.constData(), dir.fd, name.toLocal8Bit().constData(), AT_SYMLINK_FOLLOW) == 0) {
+        if (::linkat(AT_FDCWD, procPath.constData(), dir.fd, name.toLocal8Bit().constData(),
+                     AT_SYMLINK_FOLLOW) == 0) {
             const QString saved = folder_ + QLatin1Char('/') + name;
             std::lock_guard lock(lastSavedMutex);
             *lastSaved_ = saved;
@@ -189,9 +185,10 @@ QString PhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error)
     return {};
 }
 
-void PhotoAlbum::performChanges_creationRequestForAssetFromVideoAtFileURL(const QUrl& fileURL, Completion completion)
-{
-    GlobalQueue::async(QueuePriority::Default, [album = *this, fileURL, completion = std::move(completion)]() mutable {
+void PhotoAlbum::performChanges_creationRequestForAssetFromVideoAtFileURL(const QUrl& fileURL,
+                                                                          Completion completion) {
+    GlobalQueue::async(QueuePriority::Default, [album = *this, fileURL,
+                                                completion = std::move(completion)]() mutable {
         ErrorPtr error;
         const QString path = fileURL.isLocalFile() ? fileURL.toLocalFile() : fileURL.toString();
         const bool saved = !album.importVideo(path, &error).isEmpty();
@@ -200,8 +197,7 @@ void PhotoAlbum::performChanges_creationRequestForAssetFromVideoAtFileURL(const 
     });
 }
 
-void PhotoAlbum::saveVideoAtPathToAlbum(const QString& path)
-{
+void PhotoAlbum::saveVideoAtPathToAlbum(const QString& path) {
     GlobalQueue::async(QueuePriority::Default, [album = *this, path]() mutable {
         ErrorPtr error;
         if (album.importVideo(path, &error).isEmpty())

@@ -18,7 +18,7 @@ namespace platform {
 // Callable from any thread. Work runs on the default-priority worker queue;
 // GlobalQueue::drain() waits for writes still under way.
 class PhotoAlbum {
-public:
+  public:
     enum ErrorCode {
         NotVideo = 3302,    // the file is missing or is not playable video
         NotWritable = 3310, // the album folder cannot be made or written
@@ -37,7 +37,8 @@ public:
     // "Perform a change": create an album asset from the video at `fileURL`.
     // The completion runs on a worker thread with the outcome; on success the
     // new file's host path is available through lastSavedPath().
-    void performChanges_creationRequestForAssetFromVideoAtFileURL(const QUrl& fileURL, Completion completion);
+    void performChanges_creationRequestForAssetFromVideoAtFileURL(const QUrl& fileURL,
+                                                                  Completion completion);
 
     // "Save a video file by path": fire and forget.
     void saveVideoAtPathToAlbum(const QString& path);
@@ -48,7 +49,7 @@ public:
 
     QString lastSavedPath() const;
 
-private:
+  private:
     QString folder_;
     mutable std::shared_ptr<QString> lastSaved_ = std::make_shared<QString>();
 };
