@@ -21,9 +21,17 @@ bool isExact(const MediaTime& before, const MediaTime& after) {
 
 } // namespace
 
+Implementation<ImageGenerator::Maker>& ImageGenerator::implementation() {
+    static Implementation<Maker> chosen(
+        [](std::shared_ptr<Asset> asset) -> std::shared_ptr<ImageGenerator> {
+            return std::make_shared<DecodingImageGenerator>(std::move(asset));
+        });
+    return chosen;
+}
+
 std::shared_ptr<ImageGenerator>
 ImageGenerator::imageGeneratorWithAsset(std::shared_ptr<Asset> asset) {
-    return std::make_shared<DecodingImageGenerator>(std::move(asset));
+    return implementation().make(std::move(asset));
 }
 
 DecodingImageGenerator::DecodingImageGenerator(std::shared_ptr<Asset> asset)

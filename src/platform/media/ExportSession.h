@@ -3,6 +3,7 @@
 #include "platform/media/Asset.h"
 #include "platform/media/MediaTime.h"
 #include "platform/runtime/Error.h"
+#include "platform/runtime/Implementation.h"
 
 #include <QList>
 #include <QString>
@@ -62,12 +63,15 @@ class ExportSession {
   public:
     virtual ~ExportSession() = default;
 
-    // The real session, on FFmpeg. The pass-through preset copies the samples
-    // (the clip starts at the requested time through an edit list); the
-    // highest-quality preset re-encodes to H.264 and AAC and applies the
-    // audio mix. Null for an unknown preset.
+    // A session from implementation(): the real one on FFmpeg unless a test
+    // replaced it. The pass-through preset copies the samples (the clip
+    // starts at the requested time through an edit list); the highest-quality
+    // preset re-encodes to H.264 and AAC and applies the audio mix. Null for
+    // an unknown preset.
     static std::shared_ptr<ExportSession>
     exportSessionWithAsset_presetName(std::shared_ptr<Asset> asset, const QString& presetName);
+    using Maker = std::shared_ptr<ExportSession>(std::shared_ptr<Asset>, const QString&);
+    static Implementation<Maker>& implementation();
 
     virtual std::shared_ptr<Asset> asset() const = 0;
     virtual QString presetName() const = 0;

@@ -3,6 +3,7 @@
 #include "platform/media/Asset.h"
 #include "platform/media/MediaTime.h"
 #include "platform/runtime/Error.h"
+#include "platform/runtime/Implementation.h"
 
 #include <QImage>
 #include <QList>
@@ -34,8 +35,11 @@ class ImageGenerator {
   public:
     virtual ~ImageGenerator() = default;
 
-    // The real generator, decoding with FFmpeg.
+    // A generator from implementation(): the real one, decoding with FFmpeg,
+    // unless a test replaced it.
     static std::shared_ptr<ImageGenerator> imageGeneratorWithAsset(std::shared_ptr<Asset> asset);
+    using Maker = std::shared_ptr<ImageGenerator>(std::shared_ptr<Asset>);
+    static Implementation<Maker>& implementation();
 
     virtual std::shared_ptr<Asset> asset() const = 0;
 

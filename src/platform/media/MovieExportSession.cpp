@@ -51,12 +51,21 @@ class TemporaryOutput {
 
 } // namespace
 
+Implementation<ExportSession::Maker>& ExportSession::implementation() {
+    static Implementation<Maker> chosen(
+        [](std::shared_ptr<Asset> asset,
+           const QString& presetName) -> std::shared_ptr<ExportSession> {
+            if (presetName != ExportPresetPassthrough && presetName != ExportPresetHighestQuality)
+                return nullptr;
+            return std::make_shared<MovieExportSession>(std::move(asset), presetName);
+        });
+    return chosen;
+}
+
 std::shared_ptr<ExportSession>
 ExportSession::exportSessionWithAsset_presetName(std::shared_ptr<Asset> asset,
                                                  const QString& presetName) {
-    if (presetName != ExportPresetPassthrough && presetName != ExportPresetHighestQuality)
-        return nullptr;
-    return std::make_shared<MovieExportSession>(std::move(asset), presetName);
+    return implementation().make(std::move(asset), presetName);
 }
 
 MovieExportSession::MovieExportSession(std::shared_ptr<Asset> asset, QString presetName)
