@@ -112,4 +112,16 @@ void Device::setGraphicsQualityOverride(std::optional<int> quality) {
     qualityOverride = quality;
 }
 
+bool Device::deviceSupportsCapability(const QString& key) {
+    static const QStringList known{VideoPublishingCapability};
+    if (!known.contains(key))
+        return false;
+    const QStringList disabled =
+        qEnvironmentVariable("TAMSEL_DISABLED_CAPABILITIES").split(u',', Qt::SkipEmptyParts);
+    for (const QString& entry : disabled)
+        if (entry.trimmed() == key)
+            return false;
+    return true;
+}
+
 } // namespace platform

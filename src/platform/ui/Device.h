@@ -36,6 +36,13 @@ class Device {
     // override replaces the probe.
     static int graphicsQuality();
     static void setGraphicsQualityOverride(std::optional<int> quality);
+
+    // Whether the device offers a capability by its key (VideoPublishingCapability,
+    // say). A desktop offers every capability it knows, except those named in
+    // TAMSEL_DISABLED_CAPABILITIES (comma-separated keys), which is how a
+    // machine, or a test, turns one off. Unknown keys are not offered.
+    static bool deviceSupportsCapability(const QString& key);
+    static inline const QString VideoPublishingCapability = QStringLiteral("video-publishing");
 };
 
 } // namespace platform
