@@ -4,12 +4,22 @@
 #include <QString>
 #include <functional>
 
-// Writes synthetic recordings (H.264 + AAC in MP4) for the tests, the
-// benchmarks and the sample that the build ships. Every frame carries its own
+// Writes synthetic recordings for the tests, the benchmarks and the sample that
+// the build ships: by default H.264 + AAC in MP4, and every container and codec
+// that Linux screen recorders write. Every frame carries its own
 // index as a block code in its top quarter, so whoever decodes a frame can tell
 // which one it is; the audio carries a short tone burst at every whole second
 // of media time, so whoever decodes both can check that they are in sync.
 namespace testmedia {
+
+enum class Container {
+    Mp4,
+    FragmentedMp4, // an empty movie box, then a fragment per keyframe
+    Matroska,
+    WebM,
+};
+enum class VideoCodec { H264, H264_444, HEVC, VP8, VP9 };
+enum class AudioCodec { AAC, Vorbis, Opus };
 
 struct MovieSpec {
     int width = 320;
@@ -25,8 +35,10 @@ struct MovieSpec {
     // Frame times drift around the nominal grid (see frameTime), as in
     // recordings whose capture rate follows the screen's refresh.
     bool variableFrameRate = false;
-    // The file is cut short after writing, as when a recorder dies mid-way:
-    // the sample tables (written last) are missing.
+    // The file is cut short after writing (at 55% of its bytes), as when a
+    // recorder dies mid-way: an MP4 lacks its sample tables (written last), a
+    // fragmented MP4 ends inside a fragment, a Matroska file (written as a
+    // live recorder writes it, without duration or cues) inside a cluster.
     bool truncated = false;
 
     // Optional beyond the common fields.
@@ -37,6 +49,18 @@ struct MovieSpec {
     bool scene = false; // a calm desktop-like scene instead of the test pattern
     int audioSampleRate = 48000;
     double audioStart = 0; // the audio track begins this many seconds in
+
+    Container container = Container::Mp4;
+    VideoCodec videoCodec = VideoCodec::H264;
+    AudioCodec audioCodec = AudioCodec::AAC;
+    // Audio tracks when `audio` is set. The second is a "microphone": its
+    // burst (see kSecondTrackBurstOffset) comes half a second after each of
+    // the first track's.
+    int audioTracks = 1;
+    // Fragmented MP4: a segment index (sidx) before the fragments.
+    bool segmentIndex = false;
+    // Every timestamp starts this late, as in a capture remuxed from a stream.
+    double startSeconds = 0;
 };
 
 // Writes the movie to `hostPath` (replacing a file there). Returns false and
@@ -70,5 +94,9 @@ int readFrameIndex(const unsigned char* luma, int width, int height, int stride)
 // has a soft chime instead, and its frames carry no code.)
 constexpr double kBurstSeconds = 0.05;
 constexpr double kBurstFrequency = 1000.0;
+constexpr double kSecondTrackBurstOffset = 0.5;
+
+// The file name suffix that suits the container (".mp4", ".mkv", ".webm").
+QString suffixFor(const MovieSpec& movieSpec);
 
 } // namespace testmedia

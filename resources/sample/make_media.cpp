@@ -15,9 +15,9 @@ int main(int argc, char** argv) {
     QCoreApplication app(argc, argv);
     QCommandLineParser parser;
     parser.setApplicationDescription(
-        "Writes an H.264 + AAC MP4 recording whose frames carry their index.");
+        "Writes a recording whose frames carry their index (H.264 + AAC in MP4 unless told).");
     parser.addHelpOption();
-    parser.addPositionalArgument("output", "The MP4 file to write.");
+    parser.addPositionalArgument("output", "The file to write.");
     const QCommandLineOption size({"s", "size"}, "Coded size, WxH.", "WxH", "320x240");
     const QCommandLineOption fps("fps", "Frames per second.", "rate", "30");
     const QCommandLineOption seconds("seconds", "Length in seconds.", "seconds", "2");
@@ -33,9 +33,17 @@ int main(int argc, char** argv) {
     const QCommandLineOption scene("scene", "A desktop-like scene instead of the test pattern.");
     const QCommandLineOption audioStart("audio-start", "Seconds before the audio begins.",
                                         "seconds", "0");
+    const QCommandLineOption container("container", "mp4, fmp4, mkv or webm.", "name", "mp4");
+    const QCommandLineOption videoCodec("video", "h264, h264-444, hevc, vp8 or vp9.", "codec",
+                                        "h264");
+    const QCommandLineOption audioCodec("audio", "aac, vorbis or opus.", "codec", "aac");
+    const QCommandLineOption audioTracks("audio-tracks", "Audio tracks (1 or 2).", "count", "1");
+    const QCommandLineOption start("start", "Seconds the timestamps start at.", "seconds", "0");
+    const QCommandLineOption sidx("sidx", "Fragmented MP4: a segment index up front.");
     const QCommandLineOption quiet({"q", "quiet"}, "No progress output.");
-    parser.addOptions({size, fps, seconds, noAudio, rotation, keyint, vfr, truncated, fastStart,
-                       bframes, preset, crf, scene, audioStart, quiet});
+    parser.addOptions({size,      fps,        seconds,    noAudio,     rotation, keyint, vfr,
+                       truncated, fastStart,  bframes,    preset,      crf,      scene,  audioStart,
+                       container, videoCodec, audioCodec, audioTracks, start,    sidx,   quiet});
     parser.process(app);
     av_log_set_level(AV_LOG_ERROR);
     if (parser.positionalArguments().size() != 1)
@@ -67,6 +75,22 @@ int main(int argc, char** argv) {
     movieSpec.crf = parser.value(crf).toInt();
     movieSpec.scene = parser.isSet(scene);
     movieSpec.audioStart = parser.value(audioStart).toDouble();
+    movieSpec.audioTracks = parser.value(audioTracks).toInt();
+    movieSpec.startSeconds = parser.value(start).toDouble();
+    movieSpec.segmentIndex = parser.isSet(sidx);
+    const QStringList containers = {"mp4", "fmp4", "mkv", "webm"};
+    const QStringList videoCodecs = {"h264", "h264-444", "hevc", "vp8", "vp9"};
+    const QStringList audioCodecs = {"aac", "vorbis", "opus"};
+    const int c = containers.indexOf(parser.value(container));
+    const int v = videoCodecs.indexOf(parser.value(videoCodec));
+    const int a = audioCodecs.indexOf(parser.value(audioCodec));
+    if (c < 0 || v < 0 || a < 0) {
+        std::fprintf(stderr, "tamsel-make-media: unknown container or codec\n");
+        return 2;
+    }
+    movieSpec.container = testmedia::Container(c);
+    movieSpec.videoCodec = testmedia::VideoCodec(v);
+    movieSpec.audioCodec = testmedia::AudioCodec(a);
 
     const bool showProgress = !parser.isSet(quiet);
     QString error;

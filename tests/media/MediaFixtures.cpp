@@ -29,7 +29,13 @@ QString keyOf(const testmedia::MovieSpec& s) {
                                   double(s.crf),
                                   double(s.scene),
                                   double(s.audioSampleRate),
-                                  s.audioStart};
+                                  s.audioStart,
+                                  double(s.container),
+                                  double(s.videoCodec),
+                                  double(s.audioCodec),
+                                  double(s.audioTracks),
+                                  double(s.segmentIndex),
+                                  s.startSeconds};
     QStringList parts;
     for (double f : fields)
         parts.append(QString::number(f));
@@ -45,7 +51,7 @@ QString movieFor(const testmedia::MovieSpec& movieSpec) {
     const QString key = keyOf(movieSpec);
     if (made.contains(key))
         return made.value(key);
-    const QString path = runDirectory().filePath(key + QStringLiteral(".mp4"));
+    const QString path = runDirectory().filePath(key + testmedia::suffixFor(movieSpec));
     QString error;
     const bool written = testmedia::writeMovie(path, movieSpec, &error);
     EXPECT_TRUE(written) << error.toStdString();
