@@ -4,7 +4,9 @@
 
 #include <QFile>
 
+#include <atomic>
 #include <cmath>
+#include <map>
 
 extern "C" {
 #include <libavcodec/avcodec.h>
@@ -14,6 +16,13 @@ extern "C" {
 
 namespace mediatest {
 namespace {
+
+std::atomic<int> errorLines{0};
+
+void countErrors(void*, int level, const char*, va_list) {
+    if (level <= AV_LOG_ERROR)
+        ++errorLines;
+}
 
 struct Closer {
     AVFormatContext* in = nullptr;
@@ -45,11 +54,19 @@ AVCodecContext* openDecoder(AVStream* stream) {
 
 ClipInfo probeClip(const QString& path, int maxFrames) {
     ClipInfo info;
+    errorLines = 0;
+    av_log_set_callback(countErrors);
+    struct Restore {
+        ~Restore() { av_log_set_callback(av_log_default_callback); }
+    } restore;
     Closer k;
     if (avformat_open_input(&k.in, QFile::encodeName(path).constData(), nullptr, nullptr) < 0 ||
         avformat_find_stream_info(k.in, nullptr) < 0)
         return info;
     info.opened = true;
+    info.format = QString::fromLatin1(k.in->iformat->name);
+    if (k.in->start_time != AV_NOPTS_VALUE)
+        info.startTime = k.in->start_time / double(AV_TIME_BASE);
     int videoIndex = -1, audioIndex = -1;
     for (unsigned i = 0; i < k.in->nb_streams; ++i) {
         AVStream* s = k.in->streams[i];
@@ -57,6 +74,7 @@ ClipInfo probeClip(const QString& path, int maxFrames) {
             ++info.videoTracks;
             if (videoIndex < 0) {
                 videoIndex = int(i);
+                info.videoCodec = QString::fromLatin1(avcodec_get_name(s->codecpar->codec_id));
                 info.width = s->codecpar->width;
                 info.height = s->codecpar->height;
                 info.videoDuration = s->duration * av_q2d(s->time_base);
@@ -70,6 +88,7 @@ ClipInfo probeClip(const QString& path, int maxFrames) {
             ++info.audioTracks;
             if (audioIndex < 0) {
                 audioIndex = int(i);
+                info.audioCodec = QString::fromLatin1(avcodec_get_name(s->codecpar->codec_id));
                 info.audioDuration = s->duration * av_q2d(s->time_base);
             }
         }
@@ -89,6 +108,8 @@ ClipInfo probeClip(const QString& path, int maxFrames) {
                         {t, testmedia::readFrameIndex(k.frame->data[0], k.frame->width,
                                                       k.frame->height, k.frame->linesize[0])});
             } else if (k.frame->format == AV_SAMPLE_FMT_FLTP) {
+                info.audioEnd =
+                    std::max(info.audioEnd, t + double(k.frame->nb_samples) / k.frame->sample_rate);
                 const float* samples = reinterpret_cast<const float*>(k.frame->extended_data[0]);
                 for (int n = 0; n < k.frame->nb_samples; ++n) {
                     const double v = std::fabs(samples[n]);
@@ -97,15 +118,25 @@ ClipInfo probeClip(const QString& path, int maxFrames) {
                     // Bursts are a second apart; the first loud sample after a
                     // long quiet is the onset.
                     if (v > 0.25 &&
-                        (info.burstOnsets.empty() || at - info.burstOnsets.back() > 0.5))
+                        (info.burstOnsets.empty() || at - info.burstOnsets.back() > 0.3))
                         info.burstOnsets.push_back(at);
                 }
             }
             av_frame_unref(k.frame);
         }
     };
+    std::map<int, std::int64_t> lastDts;
     while (av_read_frame(k.in, k.packet) >= 0) {
         const int index = k.packet->stream_index;
+        if (k.packet->dts != AV_NOPTS_VALUE) {
+            const auto last = lastDts.find(index);
+            if (last != lastDts.end() && k.packet->dts <= last->second)
+                info.decodeTimesRise = false;
+            lastDts[index] = k.packet->dts;
+        }
+        if (index == videoIndex && info.firstVideoPacket.isEmpty())
+            info.firstVideoPacket =
+                QByteArray(reinterpret_cast<const char*>(k.packet->data), k.packet->size);
         AVCodecContext* c = index == videoIndex ? k.video : index == audioIndex ? k.audio : nullptr;
         if (c) {
             avcodec_send_packet(c, k.packet);
@@ -121,7 +152,24 @@ ClipInfo probeClip(const QString& path, int maxFrames) {
         avcodec_send_packet(k.audio, nullptr);
         drain(k.audio, audioIndex);
     }
+    info.errorLines = errorLines;
     return info;
+}
+
+QList<QByteArray> videoKeyframes(const QString& path) {
+    QList<QByteArray> keyframes;
+    Closer k;
+    if (avformat_open_input(&k.in, QFile::encodeName(path).constData(), nullptr, nullptr) < 0 ||
+        avformat_find_stream_info(k.in, nullptr) < 0)
+        return keyframes;
+    const int video = av_find_best_stream(k.in, AVMEDIA_TYPE_VIDEO, -1, -1, nullptr, 0);
+    while (av_read_frame(k.in, k.packet) >= 0) {
+        if (k.packet->stream_index == video && (k.packet->flags & AV_PKT_FLAG_KEY))
+            keyframes.append(
+                QByteArray(reinterpret_cast<const char*>(k.packet->data), k.packet->size));
+        av_packet_unref(k.packet);
+    }
+    return keyframes;
 }
 
 } // namespace mediatest

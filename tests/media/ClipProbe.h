@@ -1,5 +1,7 @@
 #pragma once
 
+#include <QByteArray>
+#include <QList>
 #include <QString>
 #include <QTransform>
 
@@ -18,18 +20,34 @@ struct ShownFrame {
 
 struct ClipInfo {
     bool opened = false;
+    QString format;     // the demuxer's name ("mov,mp4,m4a,3gp,3g2,mj2" for MP4)
+    QString videoCodec; // FFmpeg's codec names
+    QString audioCodec;
+    double startTime = 0; // seconds, of the earliest stream (what players count from)
     int videoTracks = 0;
     int audioTracks = 0;
     int width = 0, height = 0;
     QTransform transform;     // from the display matrix
     double videoDuration = 0; // seconds, from the container
     double audioDuration = 0;
+    double audioEnd = 0;             // seconds, where the last decoded audio sample ends
     std::vector<ShownFrame> frames;  // decoded, up to maxFrames
     std::vector<double> burstOnsets; // seconds, where the audio rises above half scale
     double audioPeak = 0;            // largest absolute sample
+    // Lines FFmpeg logged at error level or worse while reading and decoding.
+    int errorLines = 0;
+    // Every track's decode times rise from packet to packet.
+    bool decodeTimesRise = true;
+    // The first video packet's payload, to tell a copied stream from an
+    // encoded one.
+    QByteArray firstVideoPacket;
 };
 
 // Decodes up to `maxFrames` video frames (all when -1) and the whole audio.
+// Not to be called while another thread uses FFmpeg's log.
 ClipInfo probeClip(const QString& path, int maxFrames = -1);
+
+// The payloads of a movie's video keyframes, in file order.
+QList<QByteArray> videoKeyframes(const QString& path);
 
 } // namespace mediatest

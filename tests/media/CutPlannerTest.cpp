@@ -102,8 +102,13 @@ TEST(CutPlanner, MovingTheStartBackKeepsTheEnd) {
     EXPECT_EQ(moved.hiddenLead, 15 * 3000);
     EXPECT_EQ(moved.offset + moved.editDuration, cut.offset + cut.editDuration);
     EXPECT_EQ(moved.firstDts, cut.firstDts);
-    // Never later than planned, and an empty cut stays empty.
-    EXPECT_EQ(startingAt(cut, 50 * 3000).offset, cut.offset);
+    // Later, when the video begins after the requested start: what plays
+    // shrinks, nothing plays once the start reaches the end, and an empty cut
+    // stays empty.
+    const TrackCut later = startingAt(cut, 50 * 3000);
+    EXPECT_EQ(later.offset, 50 * 3000);
+    EXPECT_EQ(later.offset + later.editDuration, cut.offset + cut.editDuration);
+    EXPECT_TRUE(startingAt(cut, 100 * 3000).empty);
     EXPECT_TRUE(startingAt(TrackCut{}, 0).empty);
 }
 
@@ -115,4 +120,27 @@ TEST(CutPlanner, SyncSampleLookup) {
     EXPECT_EQ(syncSampleAtOrBefore(s, 20), 2);
     EXPECT_EQ(syncSampleAtOrBefore(s, 1000), 2);
     EXPECT_EQ(syncSampleAtOrBefore({}, 5), -1);
+}
+
+// Matroska cues often list only the video's keyframes: the audio must still
+// be planned (and read from early enough to keep its priming), and video
+// without an index is read from the start itself, the reader finding the
+// keyframe.
+TEST(CutPlanner, TracksTheIndexLeavesOutAreStillCut) {
+    TrackInfo unindexedAudio = audio(500);
+    unindexedAudio.syncSamples.clear();
+    TrackCut cut = planTrack(unindexedAudio, 48000, 96000);
+    ASSERT_FALSE(cut.empty);
+    EXPECT_LE(cut.firstPts, 48000 - 2 * 1024);
+    EXPECT_EQ(cut.offset, 48000);
+    EXPECT_EQ(cut.stopAt, 96000);
+    EXPECT_EQ(cut.editDuration, 48000);
+
+    TrackInfo unindexedVideo = video(300, 30, 3000);
+    unindexedVideo.syncSamples.clear();
+    cut = planTrack(unindexedVideo, 45 * 3000, 100 * 3000);
+    ASSERT_FALSE(cut.empty);
+    EXPECT_EQ(cut.firstDts, 45 * 3000);
+    EXPECT_EQ(cut.editDuration, 55 * 3000);
+    EXPECT_TRUE(planTrack(unindexedVideo, 400 * 3000, 500 * 3000).empty);
 }

@@ -54,6 +54,11 @@ std::shared_ptr<Asset> Asset::assetWithURL(const QUrl& url) {
         return asset;
     }
 
+    // Times count from the movie's earliest sample, as players count them: a
+    // capture remuxed from a stream may start its timestamps anywhere.
+    const MediaTime movieStart = input->start_time == AV_NOPTS_VALUE
+                                     ? MediaTime::zero()
+                                     : StreamTime::toMediaTime(input->start_time, AV_TIME_BASE_Q);
     MediaTime end = MediaTime::invalid();
     std::int32_t durationScale = 0;
     for (unsigned i = 0; i < input->nb_streams; ++i) {
@@ -76,8 +81,9 @@ std::shared_ptr<Asset> Asset::assetWithURL(const QUrl& url) {
         std::int64_t length = stream->duration;
         if (length == AV_NOPTS_VALUE && input->duration != AV_NOPTS_VALUE)
             length = StreamTime::rescale(input->duration, AV_TIME_BASE_Q, stream->time_base);
-        track.timeRange = MediaTimeRange::make(StreamTime::toMediaTime(start, stream->time_base),
-                                               StreamTime::toMediaTime(length, stream->time_base));
+        track.timeRange =
+            MediaTimeRange::make(StreamTime::toMediaTime(start, stream->time_base) - movieStart,
+                                 StreamTime::toMediaTime(length, stream->time_base));
         if (track.timeRange.isValid()) {
             if (!end.isValid() || track.timeRange.end() > end)
                 end = track.timeRange.end();

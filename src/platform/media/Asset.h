@@ -27,8 +27,10 @@ struct AssetTrack {
 };
 
 // A movie file and what its headers say: the tracks, in stream order, and the
-// duration. Immutable once made, so any thread may read it. Streams other than
-// video and audio (data, subtitles, cover art) are not tracks.
+// duration. Times count from the movie's earliest sample (whatever its
+// timestamps start at), as the player's do. Immutable once made, so any
+// thread may read it. Streams other than video and audio (data, subtitles,
+// cover art) are not tracks.
 class Asset {
   public:
     // Opens the URL (device paths are mapped) and reads its headers

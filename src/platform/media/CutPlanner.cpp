@@ -22,11 +22,19 @@ TrackCut planTrack(const TrackInfo& track, std::int64_t start, std::int64_t end)
     TrackCut cut;
     start = std::max<std::int64_t>(start, 0);
     end = std::min(end, track.end);
-    if (end <= start || track.syncSamples.empty())
+    if (end <= start)
         return cut;
-    const std::int64_t decodeFrom = track.kind == TrackKind::Audio ? start - track.preroll : start;
-    const int first = syncSampleAtOrBefore(track.syncSamples, decodeFrom);
-    const SyncSample& sync = track.syncSamples[first];
+    const bool audio = track.kind == TrackKind::Audio;
+    const std::int64_t decodeFrom = audio ? start - track.preroll : start;
+    SyncSample sync{decodeFrom, decodeFrom};
+    if (!track.syncSamples.empty()) {
+        sync = track.syncSamples[syncSampleAtOrBefore(track.syncSamples, decodeFrom)];
+    } else if (audio) {
+        // Every audio frame is a sync sample, but where they lie is unknown
+        // (Matroska cues often list the video alone): from one frame earlier
+        // the frame that holds the priming is surely among those read.
+        sync = {decodeFrom - track.preroll, decodeFrom - track.preroll};
+    }
     cut.empty = false;
     cut.firstDts = sync.dts;
     cut.firstPts = sync.pts;
@@ -38,10 +46,12 @@ TrackCut planTrack(const TrackInfo& track, std::int64_t start, std::int64_t end)
 }
 
 TrackCut startingAt(const TrackCut& cut, std::int64_t newStart) {
-    if (cut.empty || newStart >= cut.offset)
+    if (cut.empty || newStart == cut.offset)
         return cut;
     TrackCut moved = cut;
     const std::int64_t end = cut.offset + cut.editDuration;
+    if (newStart >= end)
+        return TrackCut{};
     moved.offset = newStart;
     moved.hiddenLead = std::max<std::int64_t>(0, newStart - cut.firstPts);
     moved.editDuration = end - newStart;

@@ -45,13 +45,16 @@ struct TrackCut {
 
 // The cut of one track for the requested [start, end). A start before the
 // track's first sync sample starts at that sample; an end past the track is
-// clipped to it.
+// clipped to it. Without sync samples (an index that leaves the track out),
+// reading starts at the start itself for video (the reader finds the
+// keyframe), one frame before the priming for audio.
 TrackCut planTrack(const TrackInfo& track, std::int64_t start, std::int64_t end);
 
-// The same cut made to start at `newStart`, at or before the planned start
-// (the presentation time of the frame shown at the requested start, so that
-// every player begins with that frame, whatever it does with a frame that
-// straddles the edit's start). The end stays where it was.
+// The same cut made to start at `newStart`: the presentation time of the
+// frame shown at the requested start (at or before it; or, when the video
+// begins after it, the first frame's), so that every player begins with that
+// frame, whatever it does with a frame that straddles the edit's start. The
+// end stays where it was; a start at or past it leaves nothing.
 TrackCut startingAt(const TrackCut& cut, std::int64_t newStart);
 
 // The sync sample to start from for `target`: the last whose presentation

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "ExportRules.h"
 #include "platform/media/Asset.h"
 #include "platform/media/ExportSession.h"
 
@@ -10,12 +11,14 @@
 namespace platform {
 
 // What the session hands to the code that writes the file: where from, where
-// to (the temporary name), which range (already clipped to the asset), and how
-// to report. Internal to the media adapter.
+// to (the temporary name), which range (already clipped to the asset; 0 is the
+// movie's first sample), what may be copied, and how to report. Internal to
+// the media adapter.
 struct ExportJob {
     QString sourcePath;
     QString outputPath;
     MediaTimeRange range;
+    CopyRule rule = CopyRule::WhatMp4Holds;
     std::optional<AudioMix> audioMix;
     const std::atomic<bool>* cancelled = nullptr;
     std::function<void(float)> progress;
@@ -26,17 +29,14 @@ struct ExportJob {
 // The code an export reports when it stopped because it was cancelled.
 constexpr int kExportCancelledCode = -0x54584e43; // FFERRTAG-like, distinct from FFmpeg's
 
-// Copies the samples of the range (pass-through preset). Null on success.
-ErrorPtr runPassthroughExport(const ExportJob& job);
+// Writes the clip: the span copy when the source qualifies, else the
+// ClipWriter. Null on success.
+ErrorPtr runExport(const ExportJob& job);
 
-// The pass-through export's fast path: when the source's samples can be
-// copied as one span of the file, writes the clip that way and returns true
-// (with `error` null on success). Returns false, having written nothing,
-// when the source does not qualify; the remuxer then does the work.
+// The fast path: when every track is copied and the source's samples of the
+// range can be copied as one span of the file, writes the clip that way and
+// returns true (with `error` null on success). Returns false, having written
+// nothing, when the source does not qualify.
 bool trySpanCopyExport(const ExportJob& job, ErrorPtr* error);
-
-// Decodes and re-encodes the range to H.264 and AAC, applying the audio mix
-// (highest-quality preset). Null on success.
-ErrorPtr runReencodeExport(const ExportJob& job);
 
 } // namespace platform

@@ -64,9 +64,13 @@ class ExportSession {
     virtual ~ExportSession() = default;
 
     // A session from implementation(): the real one on FFmpeg unless a test
-    // replaced it. The pass-through preset copies the samples (the clip
-    // starts at the requested time through an edit list); the highest-quality
-    // preset re-encodes to H.264 and AAC and applies the audio mix. Null for
+    // replaced it. Both presets write MP4, copy the streams they may and
+    // encode the rest (H.264 at CRF 18, AAC at 192 kbit/s), starting at the
+    // frame shown at the requested time (copied video through an edit list).
+    // The pass-through preset copies every stream that MP4 holds as it is;
+    // the highest-quality preset, made for uploading, copies H.264, HEVC,
+    // VP9, AV1, AAC and Opus. An audio mix naming several audio tracks mixes
+    // them into one; a track at a volume other than 1 is encoded. Null for
     // an unknown preset.
     static std::shared_ptr<ExportSession>
     exportSessionWithAsset_presetName(std::shared_ptr<Asset> asset, const QString& presetName);

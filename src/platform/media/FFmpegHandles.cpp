@@ -1,5 +1,7 @@
 #include "FFmpegHandles.h"
 
+#include "SourceEnds.h"
+
 #include <QFile>
 
 #include <mutex>
@@ -13,6 +15,13 @@ QString errorText(int averror) {
 }
 
 InputPtr openInput(const QString& hostPath, int* averror) {
+    InputPtr input = openInputAsIs(hostPath, averror);
+    if (input)
+        settleEnds(input.get(), hostPath);
+    return input;
+}
+
+InputPtr openInputAsIs(const QString& hostPath, int* averror) {
     // FFmpeg chats on stderr at info level (encoder settings and the like);
     // its errors are all we want there, ours go to the system log.
     static std::once_flag quiet;

@@ -62,10 +62,13 @@ inline PacketPtr makePacket() {
 QString errorText(int averror);
 
 // Opens `hostPath` for reading and reads its headers (and, when the container
-// leaves codec parameters out, probes the streams). Quiets FFmpeg's own
-// logging to errors the first time it runs. Returns null and sets `averror`
-// on failure.
+// leaves codec parameters out, probes the streams), and settles the streams'
+// lengths where the headers leave them out (see SourceEnds.h). Quiets
+// FFmpeg's own logging to errors the first time it runs. Returns null and
+// sets `averror` on failure.
 InputPtr openInput(const QString& hostPath, int* averror);
+// The same without settling the lengths.
+InputPtr openInputAsIs(const QString& hostPath, int* averror);
 
 // A decoder for `stream`, opened, with `threads` threads (0: FFmpeg's
 // choice). Null when the codec is unknown or will not open.

@@ -195,10 +195,11 @@ ErrorPtr MovieExportSession::write() {
     job.outputPath = temporary.path();
     job.range = MediaTimeRange::fromStartToEnd(requested.start, end);
     job.audioMix = audioMix();
+    job.rule =
+        preset_ == ExportPresetPassthrough ? CopyRule::WhatMp4Holds : CopyRule::WhatUploadsAccept;
     job.cancelled = &cancelled_;
     job.progress = [this](float done) { progress_ = std::clamp(done, 0.0f, 0.999f); };
-    ErrorPtr failure =
-        preset_ == ExportPresetPassthrough ? runPassthroughExport(job) : runReencodeExport(job);
+    ErrorPtr failure = runExport(job);
     if (failure)
         return failure;
     if (cancelled_)

@@ -8,6 +8,7 @@
 #include "ExportJob.h"
 #include "FFmpegHandles.h"
 #include "Mp4Box.h"
+#include "SourceIndex.h"
 #include "StreamTime.h"
 
 #include <QFile>
@@ -24,13 +25,7 @@ namespace {
 
 using mp4::Box;
 
-struct Sample {
-    std::int64_t dts;
-    std::int64_t pos;
-    std::int64_t duration;
-    int size;
-    bool key;
-};
+using Sample = IndexedSample;
 
 struct SpanTrack {
     AVStream* stream = nullptr;
@@ -284,6 +279,11 @@ bool writeTrack(mp4::Writer& w, const SpanTrack& t, int movieScale, std::int64_t
 } // namespace
 
 bool trySpanCopyExport(const ExportJob& job, ErrorPtr* error) {
+    // A mix or a volume change needs the audio encoded.
+    if (job.audioMix)
+        for (const AudioMixInputParameters& p : job.audioMix->inputParameters)
+            if (p.volume != 1.0f || job.audioMix->inputParameters.size() > 1)
+                return false;
     int err = 0;
     ffmpeg::InputPtr input = ffmpeg::openInput(job.sourcePath, &err);
     if (!input || !std::strstr(input->iformat->name, "mp4"))
@@ -304,55 +304,43 @@ bool trySpanCopyExport(const ExportJob& job, ErrorPtr* error) {
     const int movieScale = int(mp4::read32(moov, mvhd->body + (mvhdWide ? 20 : 12)));
     if (movieScale <= 0)
         return false;
+    // Fragments keep their samples out of the movie box, and may reorder
+    // them in their run boxes: the ClipWriter takes those.
+    SourceIndex index = SourceIndex::scan(input.get(), job.sourcePath);
+    if (index.fragmented())
+        return false;
+    const MediaTime movieStart = input->start_time == AV_NOPTS_VALUE
+                                     ? MediaTime::zero()
+                                     : StreamTime::toMediaTime(input->start_time, AV_TIME_BASE_Q);
 
-    // Plan every track from the demuxer's index, as the remuxer would.
+    // Plan every track from the index, as the ClipWriter would.
     std::vector<SpanTrack> tracks;
     int videoTrack = -1;
     for (unsigned i = 0; i < input->nb_streams; ++i) {
         AVStream* stream = input->streams[i];
-        const AVMediaType type = stream->codecpar->codec_type;
-        if ((type != AVMEDIA_TYPE_VIDEO && type != AVMEDIA_TYPE_AUDIO) ||
-            (stream->disposition & AV_DISPOSITION_ATTACHED_PIC))
+        const IndexedTrack* indexed = index.track(int(i));
+        if (!indexed)
             continue;
+        if (!copiesAsItIs(job.rule, stream->codecpar->codec_id) || indexed->reordered)
+            return false;
         SpanTrack track;
         track.stream = stream;
         track.trak = trackBox(moov, stream->id);
         if (track.trak.isEmpty() || !qualifies(track.trak, &track.syncTable))
             return false;
-        const bool video = type == AVMEDIA_TYPE_VIDEO;
-        CutPlanner::TrackInfo info;
-        info.kind = video ? CutPlanner::TrackKind::Video : CutPlanner::TrackKind::Audio;
-        const int entries = avformat_index_get_entries_count(stream);
-        std::vector<Sample> all;
-        all.reserve(entries);
-        for (int e = 0; e < entries; ++e) {
-            const AVIndexEntry* x = avformat_index_get_entry(stream, e);
-            if (!x || x->size <= 0)
-                return false;
-            const bool key = !video || (x->flags & AVINDEX_KEYFRAME);
-            all.push_back({x->timestamp, x->pos, 0, x->size, key});
-            if (key)
-                info.syncSamples.push_back({x->timestamp, x->timestamp});
-        }
+        const bool video = stream->codecpar->codec_type == AVMEDIA_TYPE_VIDEO;
+        const std::vector<Sample>& all = indexed->samples;
         if (all.empty())
             continue;
-        const std::int64_t start = stream->start_time == AV_NOPTS_VALUE ? 0 : stream->start_time;
         if (stream->duration == AV_NOPTS_VALUE)
             return false;
-        info.end = start + stream->duration;
-        for (size_t s = 0; s + 1 < all.size(); ++s)
-            all[s].duration = all[s + 1].dts - all[s].dts;
-        all.back().duration = std::max<std::int64_t>(1, info.end - all.back().dts);
-        if (!video) {
-            const int frame =
-                stream->codecpar->frame_size > 0 ? stream->codecpar->frame_size : 1024;
-            const int rate =
-                stream->codecpar->sample_rate > 0 ? stream->codecpar->sample_rate : 48000;
-            info.preroll = StreamTime::rescale(frame, AVRational{1, rate}, stream->time_base);
-        }
+        for (const Sample& s : all)
+            if (s.size <= 0)
+                return false;
         track.cut = CutPlanner::planTrack(
-            info, StreamTime::fromMediaTime(job.range.start, stream->time_base),
-            StreamTime::fromMediaTime(job.range.end(), stream->time_base));
+            indexed->info,
+            StreamTime::fromMediaTime(job.range.start + movieStart, stream->time_base),
+            StreamTime::fromMediaTime(job.range.end() + movieStart, stream->time_base));
         if (track.cut.empty)
             continue;
         for (const Sample& s : all)
@@ -365,7 +353,7 @@ bool trySpanCopyExport(const ExportJob& job, ErrorPtr* error) {
         tracks.push_back(std::move(track));
     }
     if (tracks.empty())
-        return false; // the remuxer reports why
+        return false; // the ClipWriter reports why
 
     // Start at the frame shown at the requested start, as the remuxer does.
     if (videoTrack >= 0) {

@@ -18,6 +18,8 @@ struct VideoFrameReader::State {
     ffmpeg::FramePtr held = ffmpeg::makeFrame();
     AVStream* stream = nullptr;
     std::int64_t firstKeyframeTimestamp = AV_NOPTS_VALUE;
+    // Where the movie's time 0 lies on the stream's timeline.
+    MediaTime movieStart = MediaTime::zero();
 };
 
 namespace {
@@ -71,6 +73,8 @@ std::unique_ptr<VideoFrameReader> VideoFrameReader::open(const QString& hostPath
     for (unsigned i = 0; i < state->input->nb_streams; ++i)
         state->input->streams[i]->discard = int(i) == index ? AVDISCARD_DEFAULT : AVDISCARD_ALL;
     state->stream = state->input->streams[index];
+    if (state->input->start_time != AV_NOPTS_VALUE)
+        state->movieStart = StreamTime::toMediaTime(state->input->start_time, AV_TIME_BASE_Q);
     // One thread: a single frame comes out right after its packet, where
     // frame threads would hold it back until they all have work.
     state->decoder = ffmpeg::openDecoder(state->stream, 1, &err);
@@ -94,7 +98,7 @@ VideoFrameReader::Frame VideoFrameReader::frameAt(const MediaTime& time, bool ex
     AVFormatContext* input = d->input.get();
     AVStream* stream = d->stream;
     AVCodecContext* decoder = d->decoder.get();
-    const std::int64_t target = StreamTime::fromMediaTime(time, stream->time_base);
+    const std::int64_t target = StreamTime::fromMediaTime(time + d->movieStart, stream->time_base);
     if (target == AV_NOPTS_VALUE) {
         setError(error, makeError(AVERROR(EINVAL), mediaErrorDomain(),
                                   QStringLiteral("not a time: %1").arg(time.description())));
@@ -187,7 +191,7 @@ VideoFrameReader::Frame VideoFrameReader::frameAt(const MediaTime& time, bool ex
     std::uint8_t* dst[] = {image.bits()};
     const int dstStride[] = {int(image.bytesPerLine())};
     sws_scale(d->sws.get(), f->data, f->linesize, 0, f->height, dst, dstStride);
-    Frame result{image, StreamTime::toMediaTime(heldPts, stream->time_base)};
+    Frame result{image, StreamTime::toMediaTime(heldPts, stream->time_base) - d->movieStart};
     av_frame_unref(d->held.get());
     return result;
 }
