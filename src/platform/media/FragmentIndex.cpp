@@ -151,6 +151,43 @@ bool readFragment(const QByteArray& moof, qint64 moofAt, qint64 fileSize,
     return true;
 }
 
+// Whether the movie box holds a movie extends box, read from the box
+// headers alone: most files are not fragmented, and their movie boxes are
+// large.
+bool declaresFragments(QFile& file) {
+    const qint64 fileSize = file.size();
+    qint64 at = 0, end = fileSize;
+    bool inMoov = false;
+    while (at + 8 <= end) {
+        if (!file.seek(at))
+            return false;
+        const QByteArray header = file.read(16);
+        if (header.size() < 8)
+            return false;
+        quint64 size = mp4::read32(header, 0);
+        qint64 headerSize = 8;
+        if (size == 1 && header.size() == 16) {
+            size = mp4::read64(header, 8);
+            headerSize = 16;
+        } else if (size == 0) {
+            size = quint64(end - at);
+        }
+        if (size < quint64(headerSize))
+            return false;
+        const QByteArray type = header.mid(4, 4);
+        if (inMoov && type == "mvex")
+            return true;
+        if (!inMoov && type == "moov") {
+            inMoov = true;
+            end = std::min<qint64>(fileSize, at + qint64(size));
+            at += headerSize;
+            continue;
+        }
+        at += qint64(size);
+    }
+    return false;
+}
+
 } // namespace
 
 const FragmentTrack* FragmentIndex::track(int trackId) const {
@@ -162,7 +199,7 @@ const FragmentTrack* FragmentIndex::track(int trackId) const {
 
 std::optional<FragmentIndex> FragmentIndex::read(const QString& hostPath) {
     QFile file(hostPath);
-    if (!file.open(QIODevice::ReadOnly))
+    if (!file.open(QIODevice::ReadOnly) || !declaresFragments(file))
         return std::nullopt;
     qint64 moovAt = 0;
     const QByteArray moov = mp4::readTopLevelBox(file, "moov", &moovAt, 64 << 20);
