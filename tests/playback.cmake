@@ -17,6 +17,7 @@ tamsel_add_tests(tamsel_playback_integration_tests integration
     playback/PlayerItemTest.cpp
     playback/PlayerTest.cpp
     playback/PlayerLayerTest.cpp
+    playback/RecordingKindsPlaybackTest.cpp
   LIBS tamsel_platform_playback tamsel_media_generator
   MAIN tamsel_playback_test_main)
 

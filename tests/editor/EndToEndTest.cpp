@@ -2,6 +2,7 @@
 // editor driven by automation, the album and the temporary directory.
 
 #include "EndToEndFixture.h"
+#include "MediaGenerator.h"
 #include "platform/media/Asset.h"
 
 #include <QCoreApplication>
@@ -14,6 +15,7 @@
 #include <QStandardPaths>
 #include <QThread>
 #include <QUrl>
+#include <algorithm>
 #include <csignal>
 
 namespace {
@@ -246,4 +248,57 @@ TEST_F(EndToEnd, TheEditorEndsWhenItsHostGoesAway) {
     EXPECT_TRUE(gone) << "the extension outlived its host";
     if (!gone)
         ::kill(pid_t(extension), SIGKILL);
+}
+
+// A GNOME-style recording (VP8 and Vorbis in WebM), trimmed and saved three
+// times in a row: each save exports from the clip the previous one left in
+// the player (whose file the editor removed first), and each lands in the
+// album as an MP4 that starts where the handles said.
+TEST_F(EndToEnd, TrimmingASavedClipAgainSavesAgainAsOftenAsAsked) {
+    testmedia::MovieSpec movieSpec;
+    movieSpec.seconds = 8;
+    movieSpec.container = testmedia::Container::WebM;
+    movieSpec.videoCodec = testmedia::VideoCodec::VP8;
+    movieSpec.audioCodec = testmedia::AudioCodec::Vorbis;
+    const QString webm = dir->filePath("gnome-recording.webm");
+    QString error;
+    ASSERT_TRUE(testmedia::writeMovie(webm, movieSpec, &error)) << error.toStdString();
+    const QByteArray original = hashOf(webm);
+    const Run run = edit(R"(
+wait ready
+drag end 6
+tap trimButton
+wait exporting=false 60
+wait ready
+drag end 4
+tap trimButton
+wait exporting=false 60
+wait ready
+drag end 2
+tap trimButton
+wait exporting=false 60
+wait ready
+dump
+tap doneButton
+)",
+                         webm);
+    ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
+    ASSERT_EQ(run.dumps.size(), 1) << run.out.toStdString();
+    EXPECT_FALSE(run.dumps[0]["exporting"].toBool());
+    EXPECT_NEAR(run.dumps[0]["editEndTime"].toDouble(), 2.0, 0.1);
+    EXPECT_EQ(hashOf(webm), original);
+    EXPECT_TRUE(tempFiles().isEmpty()) << tempFiles().join(", ").toStdString();
+    QStringList clips = albumFiles();
+    ASSERT_EQ(clips.size(), 3) << clips.join(", ").toStdString();
+    QList<double> lengths;
+    for (const QString& clip : clips) {
+        EXPECT_TRUE(clip.endsWith(".mp4"));
+        lengths.append(platform::Asset::assetWithURL(QUrl::fromLocalFile(album.filePath(clip)))
+                           ->duration()
+                           .seconds());
+    }
+    std::sort(lengths.begin(), lengths.end());
+    EXPECT_NEAR(lengths[0], 2.0, 0.1);
+    EXPECT_NEAR(lengths[1], 4.0, 0.1);
+    EXPECT_NEAR(lengths[2], 6.0, 0.1);
 }

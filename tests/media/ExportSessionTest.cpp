@@ -2,6 +2,7 @@
 #include "ExportChecks.h"
 #include "MediaFixtures.h"
 #include "platform/media/Asset.h"
+#include "platform/media/ImageGenerator.h"
 #include "support/TempDir.h"
 
 #include <QDir>
@@ -247,4 +248,35 @@ TEST(ExportSessionHighestQuality, EncodesTheAudioAtTheMixVolume) {
     // The bursts peak at 0.5 in the source; a quarter of that here.
     EXPECT_NEAR(clip.audioPeak, 0.125, 0.03);
     EXPECT_TRUE(videoKeyframes(source).contains(clip.firstVideoPacket));
+}
+
+// The editor plays the clip it saved, removes it before the next save and
+// exports the next clip from the same asset: the asset keeps reading it.
+TEST(ExportSessionPassthrough, ExportsFromAnAssetWhoseFileWasRemoved) {
+    testmedia::MovieSpec movieSpec;
+    movieSpec.seconds = 3;
+    const QString clip = scratchPath(QStringLiteral("saved-clip.mp4"));
+    ASSERT_TRUE(QFile::copy(movieFor(movieSpec), clip));
+    const auto asset = Asset::assetWithURL(QUrl::fromLocalFile(clip));
+    ASSERT_TRUE(QFile::remove(clip));
+    for (int round = 1; round <= 3; ++round) {
+        SCOPED_TRACE(round);
+        const QString output = scratchPath(QStringLiteral("again.mp4"));
+        auto session =
+            ExportSession::exportSessionWithAsset_presetName(asset, ExportPresetPassthrough);
+        session->setOutputURL(QUrl::fromLocalFile(output));
+        session->setOutputFileType(FileTypeMPEG4);
+        session->setTimeRange(MediaTimeRange::make(MediaTime::fromSeconds(0.5 * round, 600),
+                                                   MediaTime::fromSeconds(1.0, 600)));
+        ExportRun run{session};
+        ASSERT_TRUE(run.runAndWait());
+        ASSERT_EQ(run.session->status(), int(ExportSessionStatus::Completed)) << run.why();
+        EXPECT_EQ(probeClip(output, 1).frames.front().index, frameAt(movieSpec, 0.5 * round));
+    }
+    auto generator = ImageGenerator::imageGeneratorWithAsset(asset);
+    MediaTime actual;
+    EXPECT_FALSE(
+        generator
+            ->copyImageAtTime_actualTime_error(MediaTime::fromSeconds(1, 600), &actual, nullptr)
+            .isNull());
 }

@@ -4,7 +4,12 @@
 #include "StreamTime.h"
 #include "platform/runtime/DevicePaths.h"
 
+#include <QFile>
 #include <QFileInfo>
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
 
 extern "C" {
 #include <libavutil/display.h>
@@ -46,8 +51,21 @@ std::shared_ptr<Asset> Asset::assetWithURL(const QUrl& url) {
                                   QStringLiteral("not a file URL: %1").arg(shownPath));
         return asset;
     }
+    // The editor removes a clip while the asset made on it still serves the
+    // next export: the asset keeps its file open and reads through the
+    // descriptor. Opened without blocking, and kept only for a regular file.
+    asset->readablePath_ = asset->hostPath_;
+    const int fd =
+        ::open(QFile::encodeName(asset->hostPath_).constData(), O_RDONLY | O_CLOEXEC | O_NONBLOCK);
+    struct stat info {};
+    if (fd >= 0 && ::fstat(fd, &info) == 0 && S_ISREG(info.st_mode)) {
+        asset->descriptor_ = fd;
+        asset->readablePath_ = QStringLiteral("/proc/self/fd/%1").arg(fd);
+    } else if (fd >= 0) {
+        ::close(fd);
+    }
     int err = 0;
-    ffmpeg::InputPtr input = ffmpeg::openInput(asset->hostPath_, &err);
+    ffmpeg::InputPtr input = ffmpeg::openInput(asset->readablePath_, &err);
     if (!input) {
         asset->error_ = makeError(err, mediaErrorDomain(),
                                   QStringLiteral("%1: %2").arg(shownPath, ffmpeg::errorText(err)));
@@ -101,6 +119,15 @@ std::shared_ptr<Asset> Asset::assetWithURL(const QUrl& url) {
         asset->error_ = makeError(AVERROR_STREAM_NOT_FOUND, mediaErrorDomain(),
                                   QStringLiteral("%1: no video or audio track").arg(shownPath));
     return asset;
+}
+
+Asset::~Asset() {
+    if (descriptor_ >= 0)
+        ::close(descriptor_);
+}
+
+const QString& Asset::readablePath() const {
+    return readablePath_;
 }
 
 const QUrl& Asset::url() const {

@@ -38,9 +38,18 @@ class Asset {
     // without tracks, with error() set. Callable from any thread.
     static std::shared_ptr<Asset> assetWithURL(const QUrl& url);
 
+    ~Asset();
+    Asset(const Asset&) = delete;
+    Asset& operator=(const Asset&) = delete;
+
     const QUrl& url() const;
     // The host path the URL maps to (empty for a URL that is not a file).
     const QString& hostPath() const;
+    // A path that reads the file the asset opened for as long as the asset
+    // lives, even once the file is removed or replaced (the asset keeps it
+    // open): what readers of the asset's samples open. The host path when the
+    // file could not be kept open (not a regular file).
+    const QString& readablePath() const;
     QList<AssetTrack> tracks() const;
     QList<AssetTrack> tracksWithMediaType(MediaType type) const;
     // The longest track's end, at the first video track's timescale (or the
@@ -56,6 +65,8 @@ class Asset {
 
     QUrl url_;
     QString hostPath_;
+    QString readablePath_;
+    int descriptor_ = -1;
     QList<AssetTrack> tracks_;
     MediaTime duration_;
     bool playable_ = false;

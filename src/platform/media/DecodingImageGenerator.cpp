@@ -162,7 +162,7 @@ QImage DecodingImageGenerator::generate(const MediaTime& time, const Settings& s
     }
     std::lock_guard lock(readerMutex_);
     if (!reader_) {
-        reader_ = VideoFrameReader::open(asset_->hostPath(), error);
+        reader_ = VideoFrameReader::open(asset_->readablePath(), error);
         if (!reader_)
             return {};
     }

@@ -191,7 +191,7 @@ ErrorPtr MovieExportSession::write() {
 
     TemporaryOutput temporary(outputPath);
     ExportJob job;
-    job.sourcePath = asset_->hostPath();
+    job.sourcePath = asset_->readablePath();
     job.outputPath = temporary.path();
     job.range = MediaTimeRange::fromStartToEnd(requested.start, end);
     job.audioMix = audioMix();
