@@ -4,6 +4,7 @@
 #include "platform/services/album/PhotoAlbum.h"
 #include "MediaGenerator.h"
 #include "platform/runtime/GlobalQueue.h"
+#include "support/TempDir.h"
 #include "support/Wait.h"
 
 #include <QCryptographicHash>
@@ -12,7 +13,10 @@
 #include <QTemporaryDir>
 #include <atomic>
 #include <gtest/gtest.h>
+#include <linux/fs.h>
+#include <sys/ioctl.h>
 #include <sys/resource.h>
+#include <sys/stat.h>
 
 using namespace platform;
 using testing_support::waitUntil;
@@ -138,4 +142,58 @@ TEST_F(PhotoAlbumTest, FireAndForgetSavesFinishBeforeTheQueuesDrain) {
     GlobalQueue::drain();
     EXPECT_EQ(entries(folder), QStringList{"clip.mp4"});
     EXPECT_EQ(album.lastSavedPath(), folder + "/clip.mp4");
+}
+
+// The editor's clips (files of the device's storage) come in without a copy
+// of their bytes: a reflink where the file system has them, else a hard link
+// to the whole file. A host's file is copied: its owner may change it.
+TEST_F(PhotoAlbumTest, TheEditorsClipsComeInWithoutACopyAndHostFilesAreCopied) {
+    testing_support::MobileRoot mobile;
+    mobile.makeLibrary();
+    const QString clip = mobile.hostPath("Library/Tamsel/Racer_1700000000.mp4");
+    ASSERT_TRUE(QFile::copy(movie(), clip));
+    const QByteArray original = hashOf(clip);
+    // Whether this file system shares blocks between files (btrfs, XFS) or
+    // not (ext4, tmpfs): then the album's file is the clip itself.
+    const bool reflinks = [&] {
+        QFile a(mobile.hostPath("probe-a")), b(mobile.hostPath("probe-b"));
+        a.open(QIODevice::WriteOnly);
+        a.write("x");
+        a.flush();
+        b.open(QIODevice::WriteOnly);
+        return ::ioctl(b.handle(), FICLONE, a.handle()) == 0;
+    }();
+
+    struct stat clipInfo {};
+    ASSERT_EQ(::stat(QFile::encodeName(clip).constData(), &clipInfo), 0);
+    for (const QString& path :
+         {QStringLiteral("/private/var/mobile/Library/Tamsel/Racer_1700000000.mp4"), clip}) {
+        SCOPED_TRACE(path.toStdString());
+        ErrorPtr error;
+        const QString saved = album.importVideo(path, &error);
+        ASSERT_FALSE(saved.isEmpty()) << error->description().toStdString();
+        struct stat savedInfo {};
+        ASSERT_EQ(::stat(QFile::encodeName(saved).constData(), &savedInfo), 0);
+        if (reflinks || clipInfo.st_dev != savedInfo.st_dev)
+            EXPECT_NE(savedInfo.st_ino, clipInfo.st_ino);
+        else
+            EXPECT_EQ(savedInfo.st_ino, clipInfo.st_ino) << "a hard link, not a copy";
+        EXPECT_EQ(hashOf(saved), original);
+    }
+    EXPECT_EQ(entries(folder), (QStringList{"Racer_1700000000 2.mp4", "Racer_1700000000.mp4"}));
+    // The editor removes its clip; the album's stays whole.
+    ASSERT_TRUE(QFile::remove(clip));
+    EXPECT_EQ(hashOf(folder + "/Racer_1700000000.mp4"), original);
+
+    // The host's recording, on the same file system, is copied.
+    const QString host = albumRoot.filePath("recording.mp4");
+    ASSERT_TRUE(QFile::copy(movie(), host));
+    struct stat hostInfo {};
+    ASSERT_EQ(::stat(QFile::encodeName(host).constData(), &hostInfo), 0);
+    ErrorPtr error;
+    const QString saved = album.importVideo(host, &error);
+    struct stat savedInfo {};
+    ASSERT_EQ(::stat(QFile::encodeName(saved).constData(), &savedInfo), 0);
+    EXPECT_NE(savedInfo.st_ino, hostInfo.st_ino);
+    EXPECT_EQ(savedInfo.st_nlink, 1u);
 }

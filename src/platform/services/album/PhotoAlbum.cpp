@@ -6,13 +6,16 @@
 #include "platform/runtime/Log.h"
 
 #include <QDir>
+#include <QFile>
 #include <QFileInfo>
 #include <QStandardPaths>
 #include <cerrno>
 #include <csignal>
 #include <cstring>
 #include <fcntl.h>
+#include <linux/fs.h>
 #include <mutex>
+#include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -80,6 +83,13 @@ int copyContents(int in, int out) {
     }
 }
 
+// Files of the device's own storage (the editor's clips) are never written
+// again once made, so the album may share them; a host's file may change
+// under its owner, so the album gets its own copy of that.
+bool mayShare(const QString& hostPath) {
+    return DevicePaths::toDevice(hostPath).startsWith(QLatin1String("/private/var/mobile/"));
+}
+
 // "clip.mp4", "clip 2.mp4", "clip 3.mp4" ...
 QString candidateName(const QFileInfo& source, int attempt) {
     if (attempt == 1)
@@ -131,6 +141,13 @@ QString PhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error) {
     const QByteArray folder = folder_.toLocal8Bit();
     Descriptor dir;
     dir.fd = ::open(folder.constData(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    const QFileInfo sourceInfo(source);
+    auto named = [&](const QString& name) {
+        const QString saved = folder_ + QLatin1Char('/') + name;
+        std::lock_guard lock(lastSavedMutex);
+        *lastSaved_ = saved;
+        return saved;
+    };
     // The copy is written as an unnamed file in the album folder and given a
     // name only when whole, so the album never shows a partial file.
     Descriptor out;
@@ -155,14 +172,30 @@ QString PhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error) {
                 ::unlink(path.constData());
         }
     } cleanup{hiddenName};
+    // The clip's bytes are not copied where the file system can share them:
+    // a reflink (blocks shared until either side writes), else, for the
+    // device's own files, a hard link to the whole file (which, like the
+    // rename of a finished copy, never shows a partial one).
+    const bool cloned = ::ioctl(out.fd, FICLONE, in.fd) == 0;
+    if (!cloned && mayShare(source)) {
+        const QByteArray from = QFile::encodeName(source);
+        for (int attempt = 1; attempt < 10000; ++attempt) {
+            const QString name = candidateName(sourceInfo, attempt);
+            if (::linkat(AT_FDCWD, from.constData(), dir.fd, QFile::encodeName(name).constData(),
+                         0) == 0)
+                return named(name);
+            if (errno != EEXIST)
+                break; // another file system, or links not allowed: copy
+        }
+    }
     // A size limit on this process would kill it on the first byte too many.
     std::signal(SIGXFSZ, SIG_IGN);
-    if (const int err = copyContents(in.fd, out.fd); err != 0 || ::fsync(out.fd) != 0) {
+    if (const int err = cloned ? 0 : copyContents(in.fd, out.fd);
+        err != 0 || ::fsync(out.fd) != 0) {
         setError(error, errorForErrno(err ? err : errno, devicePath));
         return {};
     }
 
-    const QFileInfo sourceInfo(source);
     const QByteArray procPath =
         hiddenName.isEmpty() ? QByteArrayLiteral("/proc/self/fd/") + QByteArray::number(out.fd)
                              : hiddenName;
@@ -170,12 +203,8 @@ QString PhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error) {
         const QString name = candidateName(sourceInfo, attempt);
         // linkat never replaces: a name that is taken fails with EEXIST.
         if (::linkat(AT_FDCWD, procPath.constData(), dir.fd, name.toLocal8Bit().constData(),
-                     AT_SYMLINK_FOLLOW) == 0) {
-            const QString saved = folder_ + QLatin1Char('/') + name;
-            std::lock_guard lock(lastSavedMutex);
-            *lastSaved_ = saved;
-            return saved;
-        }
+                     AT_SYMLINK_FOLLOW) == 0)
+            return named(name);
         if (errno != EEXIST) {
             setError(error, errorForErrno(errno, folder_));
             return {};

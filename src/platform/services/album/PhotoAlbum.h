@@ -10,10 +10,12 @@
 namespace platform {
 
 // The photo album: the user's "Screen Recordings" folder in their Videos
-// (XDG videos dir), or $TAMSEL_ALBUM_DIR. A video is copied in under a unique
-// name: written under a hidden temporary name first and renamed when whole,
-// without ever replacing a file that is there. Files that are not playable
-// video are refused.
+// (XDG videos dir), or $TAMSEL_ALBUM_DIR. A video is brought in under a unique
+// name, never replacing a file that is there and never showing a partial one:
+// without copying its bytes where the file system allows (a reflink; else,
+// for a file of the device's own storage such as the editor's clips, a hard
+// link), otherwise copied under a hidden temporary name first and named when
+// whole. Files that are not playable video are refused.
 //
 // Callable from any thread. Work runs on the default-priority worker queue;
 // GlobalQueue::drain() waits for writes still under way.
