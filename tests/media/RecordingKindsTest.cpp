@@ -60,8 +60,8 @@ std::vector<Kind> kinds() {
     fragmented.segmentIndex = false;
     all.push_back({"FragmentedMp4", fragmented});
     MovieSpec full = spec(Container::Mp4, VideoCodec::H264_444, AudioCodec::AAC);
-    full.width = 322;
-    full.height = 242;
+    full.width = 321;
+    full.height = 241;
     all.push_back({"H264FullChroma", full});
     MovieSpec hevc = spec(Container::Mp4, VideoCodec::HEVC, AudioCodec::AAC);
     hevc.bFrames = 2;

@@ -56,10 +56,12 @@ void settleFragments(AVFormatContext* input, const QString& hostPath) {
 }
 
 // Reads the last part of the file (a second reader, from a byte position)
-// for the end of each stream's last complete packet.
+// for the end of each stream's last complete packet. Reads at most the last
+// 64 MB: opening must stay quick; a file with no packet there keeps what its
+// headers said.
 void settleFromTail(AVFormatContext* input, const QString& hostPath) {
     const qint64 size = QFileInfo(hostPath).size();
-    for (qint64 window = 4 << 20;; window *= 4) {
+    for (qint64 window = 4 << 20; window <= (64 << 20); window *= 4) {
         int err = 0;
         ffmpeg::InputPtr tail = ffmpeg::openInputAsIs(hostPath, &err);
         if (!tail || tail->nb_streams != input->nb_streams)
