@@ -139,8 +139,10 @@ void MovieExportSession::run(std::function<void()> handler) {
         finish(ExportSessionStatus::Cancelled, nullptr);
     } else {
         status_ = int(ExportSessionStatus::Exporting);
+        // A cancel that comes once the clip has its name is too late: the
+        // export finished.
         ErrorPtr failure = write();
-        if (cancelled_ || (failure && failure->code() == kExportCancelledCode))
+        if (failure && failure->code() == kExportCancelledCode)
             finish(ExportSessionStatus::Cancelled, nullptr);
         else if (failure)
             finish(ExportSessionStatus::Failed, failure);
