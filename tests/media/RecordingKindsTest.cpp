@@ -28,13 +28,13 @@ namespace {
 
 struct Kind {
     const char* name;
-    MovieSpec spec;
+    MovieSpec movie;
     // A range that starts between keyframes, as the user's handles do.
     double start = 1.3;
     double duration = 1.5;
 };
 
-MovieSpec spec(Container container, VideoCodec video, AudioCodec audio) {
+MovieSpec recording(Container container, VideoCodec video, AudioCodec audio) {
     MovieSpec s;
     s.seconds = 3;
     s.keyframeInterval = 30;
@@ -46,12 +46,13 @@ MovieSpec spec(Container container, VideoCodec video, AudioCodec audio) {
 
 std::vector<Kind> kinds() {
     std::vector<Kind> all;
-    all.push_back({"WebmVp8Vorbis", spec(Container::WebM, VideoCodec::VP8, AudioCodec::Vorbis)});
-    all.push_back({"WebmVp9Opus", spec(Container::WebM, VideoCodec::VP9, AudioCodec::Opus)});
-    MovieSpec mkv = spec(Container::Matroska, VideoCodec::H264, AudioCodec::AAC);
+    all.push_back(
+        {"WebmVp8Vorbis", recording(Container::WebM, VideoCodec::VP8, AudioCodec::Vorbis)});
+    all.push_back({"WebmVp9Opus", recording(Container::WebM, VideoCodec::VP9, AudioCodec::Opus)});
+    MovieSpec mkv = recording(Container::Matroska, VideoCodec::H264, AudioCodec::AAC);
     mkv.bFrames = 2;
     all.push_back({"MatroskaH264AacReordered", mkv});
-    MovieSpec fragmented = spec(Container::FragmentedMp4, VideoCodec::H264, AudioCodec::AAC);
+    MovieSpec fragmented = recording(Container::FragmentedMp4, VideoCodec::H264, AudioCodec::AAC);
     fragmented.bFrames = 2;
     all.push_back({"FragmentedMp4Reordered", fragmented});
     fragmented.segmentIndex = true;
@@ -59,29 +60,29 @@ std::vector<Kind> kinds() {
     fragmented.bFrames = 0;
     fragmented.segmentIndex = false;
     all.push_back({"FragmentedMp4", fragmented});
-    MovieSpec full = spec(Container::Mp4, VideoCodec::H264_444, AudioCodec::AAC);
+    MovieSpec full = recording(Container::Mp4, VideoCodec::H264_444, AudioCodec::AAC);
     full.width = 321;
     full.height = 241;
     all.push_back({"H264FullChroma", full});
-    MovieSpec hevc = spec(Container::Mp4, VideoCodec::HEVC, AudioCodec::AAC);
+    MovieSpec hevc = recording(Container::Mp4, VideoCodec::HEVC, AudioCodec::AAC);
     hevc.bFrames = 2;
     all.push_back({"Hevc", hevc});
-    MovieSpec silent = spec(Container::Mp4, VideoCodec::H264, AudioCodec::AAC);
+    MovieSpec silent = recording(Container::Mp4, VideoCodec::H264, AudioCodec::AAC);
     silent.audio = false;
     all.push_back({"NoAudio", silent});
-    MovieSpec twoTracks = spec(Container::Mp4, VideoCodec::H264, AudioCodec::AAC);
+    MovieSpec twoTracks = recording(Container::Mp4, VideoCodec::H264, AudioCodec::AAC);
     twoTracks.audioTracks = 2;
     all.push_back({"TwoAudioTracks", twoTracks});
-    MovieSpec vfr = spec(Container::Mp4, VideoCodec::H264, AudioCodec::AAC);
+    MovieSpec vfr = recording(Container::Mp4, VideoCodec::H264, AudioCodec::AAC);
     vfr.variableFrameRate = true;
     all.push_back({"VariableFrameRate", vfr});
-    MovieSpec late = spec(Container::Mp4, VideoCodec::H264, AudioCodec::AAC);
+    MovieSpec late = recording(Container::Mp4, VideoCodec::H264, AudioCodec::AAC);
     late.startSeconds = 3.5;
     all.push_back({"TimestampsStartLateMp4", late});
     late.container = Container::Matroska;
     late.startSeconds = 12.25;
     all.push_back({"TimestampsStartLateMatroska", late});
-    MovieSpec odd = spec(Container::WebM, VideoCodec::VP8, AudioCodec::Opus);
+    MovieSpec odd = recording(Container::WebM, VideoCodec::VP8, AudioCodec::Opus);
     odd.width = 321;
     odd.height = 239;
     all.push_back({"OddSizeVp8", odd});
@@ -148,21 +149,21 @@ void expectStrip(const std::shared_ptr<Asset>& asset, const MovieSpec& movieSpec
 
 TEST_P(RecordingKind, OpensFillsTheStripAndSavesTheRequestedRange) {
     const Kind& kind = GetParam();
-    const QString source = movieFor(kind.spec);
+    const QString source = movieFor(kind.movie);
     const QByteArray before = fileDigest(source);
     const auto asset = Asset::assetWithURL(QUrl::fromLocalFile(source));
     ASSERT_FALSE(asset->error()) << asset->error()->description().toStdString();
     ASSERT_EQ(asset->tracksWithMediaType(MediaType::Video).size(), 1);
     EXPECT_EQ(asset->tracksWithMediaType(MediaType::Audio).size(),
-              kind.spec.audio ? kind.spec.audioTracks : 0);
-    EXPECT_NEAR(asset->duration().seconds(), kind.spec.seconds, 0.1);
-    expectStrip(asset, kind.spec);
+              kind.movie.audio ? kind.movie.audioTracks : 0);
+    EXPECT_NEAR(asset->duration().seconds(), kind.movie.seconds, 0.1);
+    expectStrip(asset, kind.movie);
 
     const QString output = scratchPath(QStringLiteral("clip.mp4"));
     ExportRun run{makeSession(source, ExportPresetPassthrough, output, kind.start, kind.duration)};
     ASSERT_TRUE(run.runAndWait());
     ASSERT_EQ(run.session->status(), int(ExportSessionStatus::Completed)) << run.why();
-    expectFaithfulCut(kind.spec, source, output, kind.start, kind.duration);
+    expectFaithfulCut(kind.movie, source, output, kind.start, kind.duration);
     EXPECT_FALSE(leftovers(output));
     EXPECT_EQ(fileDigest(source), before);
 }
@@ -177,11 +178,11 @@ INSTANTIATE_TEST_SUITE_P(Recordings, RecordingKind, testing::ValuesIn(kinds()),
 // cluster. What was completely written opens, fills the strip and saves; the
 // recording is never written to.
 TEST(CutShortRecording, OpensWithWhatWasCompletelyWrittenAndSaves) {
-    MovieSpec fragmented = spec(Container::FragmentedMp4, VideoCodec::H264, AudioCodec::AAC);
+    MovieSpec fragmented = recording(Container::FragmentedMp4, VideoCodec::H264, AudioCodec::AAC);
     fragmented.seconds = 6;
     fragmented.bFrames = 2;
     fragmented.truncated = true;
-    MovieSpec webm = spec(Container::WebM, VideoCodec::VP8, AudioCodec::Vorbis);
+    MovieSpec webm = recording(Container::WebM, VideoCodec::VP8, AudioCodec::Vorbis);
     webm.seconds = 6;
     webm.truncated = true;
     for (const MovieSpec& movieSpec : {fragmented, webm}) {
@@ -218,7 +219,7 @@ TEST(CutShortRecording, OpensWithWhatWasCompletelyWrittenAndSaves) {
 // Users name their recordings as they like; nothing is quoted by a shell or
 // read as a URL, so quotes, spaces and non-ASCII letters change nothing.
 TEST(RecordingNames, QuotesSpacesAndNonAsciiLettersAreJustNames) {
-    MovieSpec movieSpec = spec(Container::WebM, VideoCodec::VP9, AudioCodec::Opus);
+    MovieSpec movieSpec = recording(Container::WebM, VideoCodec::VP9, AudioCodec::Opus);
     const QString folder = scratchPath(QStringLiteral("Bildschirmaufnahmen 'écran' \"録画\""));
     ASSERT_TRUE(QDir().mkpath(folder));
     const QString source = folder + QStringLiteral("/It's a \"test\" – ünïcode #1 ?.webm");

@@ -46,7 +46,7 @@ std::shared_ptr<ExportSession> uploadSession(const QString& source, const QStrin
 TEST(UploadPreset, CopiesWhatTheSitesTakeUntouchedAndEncodesTheRest) {
     struct Case {
         const char* name;
-        MovieSpec spec;
+        MovieSpec movie;
         const char* video;
         const char* audio;
         bool videoCopied;
@@ -63,7 +63,7 @@ TEST(UploadPreset, CopiesWhatTheSitesTakeUntouchedAndEncodesTheRest) {
     };
     for (const Case& c : cases) {
         SCOPED_TRACE(c.name);
-        const QString source = movieFor(c.spec);
+        const QString source = movieFor(c.movie);
         const QString output = scratchPath(QStringLiteral("upload.mp4"));
         ExportRun run{uploadSession(source, output)};
         ASSERT_TRUE(run.runAndWait(120000));
@@ -73,7 +73,7 @@ TEST(UploadPreset, CopiesWhatTheSitesTakeUntouchedAndEncodesTheRest) {
         EXPECT_EQ(clip.audioCodec.toStdString(), c.audio);
         // Copied means the very bytes: no generation loss.
         EXPECT_EQ(videoKeyframes(source).contains(clip.firstVideoPacket), c.videoCopied);
-        expectFaithfulCut(c.spec, source, output, 0, c.spec.seconds);
+        expectFaithfulCut(c.movie, source, output, 0, c.movie.seconds);
     }
 }
 

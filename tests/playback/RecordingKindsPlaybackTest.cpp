@@ -21,7 +21,7 @@ using testmedia::VideoCodec;
 TEST(PlaybackRecordingKinds, PreviewToTheEnd) {
     struct Case {
         const char* name;
-        MovieSpec spec;
+        MovieSpec movie;
     };
     auto make = [](Container c, VideoCodec v, AudioCodec a, auto&& tweak) {
         MovieSpec s;
@@ -50,7 +50,7 @@ TEST(PlaybackRecordingKinds, PreviewToTheEnd) {
     };
     for (const Case& c : cases) {
         SCOPED_TRACE(c.name);
-        const QUrl url = playback_test::clipUrl(QString::fromLatin1(c.name), c.spec);
+        const QUrl url = playback_test::clipUrl(QString::fromLatin1(c.name), c.movie);
         const auto asset = Asset::assetWithURL(url);
         ASSERT_FALSE(asset->error());
         auto item = PlayerItem::playerItemWithURL(url);
