@@ -1,9 +1,9 @@
 // The photo album on real files: generated movies in, unique names out, and
 // nothing partial or overwritten whatever goes wrong.
 
-#include "platform/services/album/PhotoAlbum.h"
 #include "MediaGenerator.h"
 #include "platform/runtime/GlobalQueue.h"
+#include "platform/services/album/FolderPhotoAlbum.h"
 #include "support/Wait.h"
 
 #include <QCryptographicHash>
@@ -49,7 +49,7 @@ class PhotoAlbumTest : public ::testing::Test {
     static QTemporaryDir* source;
     QTemporaryDir albumRoot;
     QString folder = albumRoot.filePath("Videos/Screen Recordings");
-    PhotoAlbum album{folder};
+    FolderPhotoAlbum album{folder};
 };
 QTemporaryDir* PhotoAlbumTest::source = nullptr;
 
