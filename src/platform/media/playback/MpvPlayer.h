@@ -24,8 +24,12 @@ class MpvCore;
 // items of this library (MpvPlayerItem); another kind of item is refused with
 // a log line.
 //
-// Threads: as Player. Nothing here waits for libmpv: commands are queued to it
-// and its events come back through the main queue.
+// Threads: as Player. Commands and property writes are queued to libmpv and
+// never wait; its events come back through the main queue. Three reads do
+// wait for libmpv's core to answer, on the main thread: the track list and
+// the duration when a file has opened, and the position when a file has
+// opened or a seek has landed without reporting one. Each is one property
+// read, but it waits while the core is busy with other work.
 class MpvPlayer final : public Player, public std::enable_shared_from_this<MpvPlayer> {
   public:
     static std::shared_ptr<MpvPlayer> make(std::shared_ptr<PlayerItem> item);
