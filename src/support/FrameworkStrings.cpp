@@ -1,11 +1,14 @@
 #include "FrameworkStrings.h"
 
 #include <array>
+#include <mutex>
 
 std::shared_ptr<platform::Bundle> TXQuillonFrameworkBundle() {
-    // A plain cache: two threads racing on first use both find the same
-    // bundle, which is harmless.
+    // Callers on any thread share the cache, so it is guarded. Not a run-once
+    // guard: a lookup that finds nothing is tried again on the next call.
+    static std::mutex mutex;
     static std::shared_ptr<platform::Bundle> bundle;
+    std::lock_guard lock(mutex);
     if (!bundle)
         bundle = platform::Bundle::bundleForClass(QStringLiteral("PhotoAlbum"));
     return bundle;
