@@ -92,8 +92,12 @@ QString candidateName(const QFileInfo& source, int attempt) {
 } // namespace
 
 Implementation<PhotoAlbum::Maker>& PhotoAlbum::implementation() {
-    static Implementation<Maker> chosen(
-        []() -> std::shared_ptr<PhotoAlbum> { return FolderPhotoAlbum::inUsersVideos(); });
+    static Implementation<Maker> chosen([]() -> std::shared_ptr<PhotoAlbum> {
+        // One album for the process: made on first use, where the user's
+        // Videos are then.
+        static const std::shared_ptr<PhotoAlbum> shared = FolderPhotoAlbum::inUsersVideos();
+        return shared;
+    });
     return chosen;
 }
 

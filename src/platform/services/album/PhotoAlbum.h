@@ -29,8 +29,8 @@ class PhotoAlbum {
 
     virtual ~PhotoAlbum() = default;
 
-    // The album from implementation(): the user's Videos unless a test
-    // replaced it.
+    // The album from implementation(): the one album of the process, in the
+    // user's Videos, unless a test replaced it.
     static std::shared_ptr<PhotoAlbum> sharedAlbum();
     using Maker = std::shared_ptr<PhotoAlbum>();
     static Implementation<Maker>& implementation();
