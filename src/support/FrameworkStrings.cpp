@@ -19,10 +19,10 @@ QString TXLocalizedFrameworkString(const QString& key) {
     if (!bundle)
         return key;
     static const std::array<QString, 4> tables = {
-        QStringLiteral("Photos-Desktop"), // this device's own table
-        QStringLiteral("Photos"),
-        QStringLiteral("PhotosSharing"),
-        QStringLiteral("PhotosPublishing"),
+        QStringLiteral("TamselAlbum-Desktop"), // this device's own table
+        QStringLiteral("TamselAlbum"),
+        QStringLiteral("TamselAlbumSharing"),
+        QStringLiteral("TamselAlbumPublishing"),
     };
     QString text = key;
     for (const QString& table : tables) {
