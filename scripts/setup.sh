@@ -4,6 +4,7 @@
 set -euo pipefail
 
 packages=(
+  clang-format # the formatting check of .ci/run
   build-essential cmake ninja-build pkg-config git ccache
   qt6-base-dev libqt6opengl6-dev qt6-multimedia-dev qt6-base-dev-tools
   libavformat-dev libavcodec-dev libavutil-dev libswscale-dev libswresample-dev

@@ -9,6 +9,7 @@
 
 #include "CutPlanner.h"
 #include "ExportJob.h"
+#include "FFmpegError.h"
 #include "FFmpegHandles.h"
 #include "Mp4EditPatch.h"
 #include "StreamTime.h"
@@ -30,10 +31,7 @@ struct CopiedTrack {
     ffmpeg::PacketPtr held; // written when the next one comes, so the last can be trimmed
 };
 
-ErrorPtr failure(int code, const QString& what) {
-    return makeError(code, mediaErrorDomain(),
-                     what + QStringLiteral(": ") + ffmpeg::errorText(code));
-}
+using ffmpeg::failure;
 
 // Presentation delay of the video's keyframes (pts - dts), learnt from the
 // first video packet; the index only has decode times.

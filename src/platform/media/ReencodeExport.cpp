@@ -3,6 +3,7 @@
 // audio mix.
 
 #include "ExportJob.h"
+#include "FFmpegError.h"
 #include "FFmpegHandles.h"
 #include "StreamTime.h"
 
@@ -18,10 +19,7 @@ extern "C" {
 namespace platform {
 namespace {
 
-ErrorPtr failure(int code, const QString& what) {
-    return makeError(code, mediaErrorDomain(),
-                     what + QStringLiteral(": ") + ffmpeg::errorText(code));
-}
+using ffmpeg::failure;
 
 struct FifoFreer {
     void operator()(AVAudioFifo* f) const { av_audio_fifo_free(f); }

@@ -2,7 +2,7 @@
 // positions and seeks.
 
 #include "MpvCore.h"
-#include "Player_Internal.h"
+#include "MpvPlayer_Internal.h"
 #include "platform/media/playback/NotificationCenter.h"
 #include "platform/runtime/Log.h"
 #include "platform/runtime/MainQueue.h"
@@ -53,7 +53,7 @@ QList<MediaTimeRange> seekableRanges(const mpv_node& cacheState, std::int32_t ti
     return ranges;
 }
 
-void Player::handleEvent(const mpv_event& event) {
+void MpvPlayer::handleEvent(const mpv_event& event) {
     switch (event.event_id) {
     case MPV_EVENT_START_FILE:
         startedEntry_ = static_cast<const mpv_event_start_file*>(event.data)->playlist_entry_id;
@@ -94,7 +94,7 @@ void Player::handleEvent(const mpv_event& event) {
     }
 }
 
-bool Player::hasPlayableTrack() const {
+bool MpvPlayer::hasPlayableTrack() const {
     mpv_node list;
     if (mpv_get_property(core_->handle(), "track-list", MPV_FORMAT_NODE, &list) < 0)
         return false;
@@ -121,7 +121,7 @@ bool Player::hasPlayableTrack() const {
     return playable;
 }
 
-void Player::handleLoadReply(const mpv_event& event) {
+void MpvPlayer::handleLoadReply(const mpv_event& event) {
     if (event.reply_userdata - kLoadReplyBase != generation_ || !item_)
         return;
     if (event.error < 0) {
@@ -144,7 +144,7 @@ void Player::handleLoadReply(const mpv_event& event) {
         handleFileLoaded();
 }
 
-void Player::handleFileLoaded() {
+void MpvPlayer::handleFileLoaded() {
     if (!item_ || loaded_)
         return;
     loaded_ = true;
@@ -164,7 +164,7 @@ void Player::handleFileLoaded() {
     updateClock();
 }
 
-void Player::handleEndFile(const mpv_event& event) {
+void MpvPlayer::handleEndFile(const mpv_event& event) {
     const auto* end = static_cast<const mpv_event_end_file*>(event.data);
     if (!item_ || expectedEntry_ < 0 || end->playlist_entry_id != expectedEntry_)
         return; // an earlier item, stopped on purpose
@@ -193,14 +193,14 @@ void Player::handleEndFile(const mpv_event& event) {
     }
 }
 
-void Player::refreshPosition() {
+void MpvPlayer::refreshPosition() {
     double seconds = 0;
     if (mpv_get_property(core_->handle(), "time-pos", MPV_FORMAT_DOUBLE, &seconds) >= 0 &&
         std::isfinite(seconds))
         position_ = seconds;
 }
 
-void Player::handlePlaybackRestart() {
+void MpvPlayer::handlePlaybackRestart() {
     // A restart before the latest seek has started belongs to one it
     // replaced.
     if (!seek_.pending || !seek_.issued || !seek_.started)
@@ -225,7 +225,7 @@ void Player::handlePlaybackRestart() {
     });
 }
 
-void Player::handleProperty(const mpv_event& event) {
+void MpvPlayer::handleProperty(const mpv_event& event) {
     const auto* property = static_cast<const mpv_event_property*>(event.data);
     switch (event.reply_userdata) {
     case kTimePos: {
@@ -289,7 +289,7 @@ void Player::handleProperty(const mpv_event& event) {
     }
 }
 
-void Player::handleEndOfItem() {
+void MpvPlayer::handleEndOfItem() {
     endReached_ = true;
     const double end =
         item_->duration().isValid() ? item_->duration().seconds() : position_.value_or(0);

@@ -2,7 +2,7 @@
 
 // Shared by the Player_*.cpp files only.
 
-#include "Player.h"
+#include "MpvPlayer.h"
 
 #include <QTimer>
 
@@ -49,7 +49,7 @@ QList<MediaTimeRange> seekableRanges(const mpv_node& cacheState, std::int32_t ti
 // Cleared when the observer is removed, so blocks already queued stay quiet.
 using Liveness = std::shared_ptr<std::atomic_bool>;
 
-struct Player::PeriodicObserver {
+struct MpvPlayer::PeriodicObserver {
     std::uint64_t id;
     Liveness alive;
     double intervalSeconds;
@@ -58,7 +58,7 @@ struct Player::PeriodicObserver {
     std::unique_ptr<QTimer> timer;
 };
 
-struct Player::BoundaryObserver {
+struct MpvPlayer::BoundaryObserver {
     std::uint64_t id;
     Liveness alive;
     QList<double> seconds; // sorted

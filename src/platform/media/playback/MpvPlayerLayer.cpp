@@ -1,5 +1,6 @@
-#include "PlayerLayer.h"
+#include "MpvPlayerLayer.h"
 
+#include "MpvPlayer.h"
 #include "VideoSurface.h"
 #include "platform/runtime/Log.h"
 #include "platform/runtime/MainQueue.h"
@@ -9,7 +10,19 @@
 
 namespace platform {
 
-PlayerLayer::PlayerLayer(QWidget* parent) : QWidget(parent) {
+Implementation<PlayerLayer::Maker>& PlayerLayer::implementation() {
+    static Implementation<Maker> chosen(
+        [](QWidget* parent) -> PlayerLayer* { return new MpvPlayerLayer(parent); });
+    return chosen;
+}
+
+PlayerLayer* PlayerLayer::playerLayerWithPlayer(std::shared_ptr<Player> player, QWidget* parent) {
+    PlayerLayer* layer = implementation().make(parent);
+    layer->setPlayer(std::move(player));
+    return layer;
+}
+
+MpvPlayerLayer::MpvPlayerLayer(QWidget* parent) : PlayerLayer(parent) {
     QPalette palette = this->palette();
     palette.setColor(QPalette::Window, Qt::black);
     setPalette(palette);
@@ -17,52 +30,46 @@ PlayerLayer::PlayerLayer(QWidget* parent) : QWidget(parent) {
     makeSurface(int(VideoSurface::preferredKind()));
 }
 
-PlayerLayer::~PlayerLayer() {
+MpvPlayerLayer::~MpvPlayerLayer() {
     // The surface gives the renderer back while the player is still held.
     surface_.reset();
     player_.reset();
 }
 
-PlayerLayer* PlayerLayer::playerLayerWithPlayer(std::shared_ptr<Player> player, QWidget* parent) {
-    auto* layer = new PlayerLayer(parent);
-    layer->setPlayer(std::move(player));
-    return layer;
-}
-
-void PlayerLayer::makeSurface(int kind) {
+void MpvPlayerLayer::makeSurface(int kind) {
     surface_ = VideoSurface::create(VideoSurface::Kind(kind), this);
     surface_->widget()->setGeometry(rect());
     surface_->widget()->show();
     if (VideoSurface::Kind(kind) == VideoSurface::Kind::OpenGL) {
         surface_->onFailed = [this] {
             // Queued: the surface is still inside its own call.
-            MainQueue::async([layer = QPointer<PlayerLayer>(this)] {
+            MainQueue::async([layer = QPointer<MpvPlayerLayer>(this)] {
                 if (!layer)
                     return;
                 logError(QStringLiteral("player: OpenGL video failed, drawing in software"));
                 layer->makeSurface(int(VideoSurface::Kind::Software));
-                layer->surface_->setPlayer(layer->player_);
+                layer->surface_->setPlayer(std::dynamic_pointer_cast<MpvPlayer>(layer->player_));
             });
         };
     }
 }
 
-void PlayerLayer::setPlayer(std::shared_ptr<Player> player) {
+void MpvPlayerLayer::setPlayer(std::shared_ptr<Player> player) {
     if (player == player_)
         return;
     player_ = std::move(player);
-    surface_->setPlayer(player_);
+    surface_->setPlayer(std::dynamic_pointer_cast<MpvPlayer>(player_));
 }
 
-bool PlayerLayer::isReadyForDisplay() const {
+bool MpvPlayerLayer::isReadyForDisplay() const {
     return surface_->hasFrame();
 }
 
-bool PlayerLayer::usesOpenGL() const {
+bool MpvPlayerLayer::usesOpenGL() const {
     return surface_->kind() == VideoSurface::Kind::OpenGL;
 }
 
-void PlayerLayer::resizeEvent(QResizeEvent* event) {
+void MpvPlayerLayer::resizeEvent(QResizeEvent* event) {
     QWidget::resizeEvent(event);
     surface_->widget()->setGeometry(rect());
 }

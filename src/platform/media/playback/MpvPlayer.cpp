@@ -1,7 +1,7 @@
-#include "Player.h"
+#include "MpvPlayer.h"
 
 #include "MpvCore.h"
-#include "Player_Internal.h"
+#include "MpvPlayer_Internal.h"
 #include "platform/runtime/DevicePaths.h"
 #include "platform/runtime/Log.h"
 #include "platform/runtime/MainQueue.h"
@@ -36,9 +36,24 @@ QByteArray uprightFilter(const Asset& asset) {
 
 } // namespace
 
-Player::Player() = default;
+Implementation<Player::Maker>& Player::implementation() {
+    static Implementation<Maker> chosen([](std::shared_ptr<PlayerItem> item) {
+        return std::shared_ptr<Player>(MpvPlayer::make(std::move(item)));
+    });
+    return chosen;
+}
 
-Player::~Player() {
+std::shared_ptr<Player> Player::playerWithPlayerItem(std::shared_ptr<PlayerItem> item) {
+    return implementation().make(std::move(item));
+}
+
+std::shared_ptr<Player> Player::playerWithURL(const QUrl& url) {
+    return playerWithPlayerItem(PlayerItem::playerItemWithURL(url));
+}
+
+MpvPlayer::MpvPlayer() = default;
+
+MpvPlayer::~MpvPlayer() {
     if (item_)
         item_->player_.reset();
     finishSeeks(false);
@@ -52,18 +67,14 @@ Player::~Player() {
     core_.reset();
 }
 
-std::shared_ptr<Player> Player::playerWithPlayerItem(std::shared_ptr<PlayerItem> item) {
-    std::shared_ptr<Player> player(new Player);
+std::shared_ptr<MpvPlayer> MpvPlayer::make(std::shared_ptr<PlayerItem> item) {
+    std::shared_ptr<MpvPlayer> player(new MpvPlayer);
     player->start();
     player->replaceCurrentItemWithPlayerItem(std::move(item));
     return player;
 }
 
-std::shared_ptr<Player> Player::playerWithURL(const QUrl& url) {
-    return playerWithPlayerItem(PlayerItem::playerItemWithURL(url));
-}
-
-void Player::start() {
+void MpvPlayer::start() {
     core_ = MpvCore::create(&startError_);
     if (!core_) {
         logError(
@@ -72,18 +83,23 @@ void Player::start() {
     }
     for (const PropertyId& property : observedProperties())
         mpv_observe_property(core_->handle(), property.id, property.name, property.format);
-    std::weak_ptr<Player> weak = weak_from_this();
+    std::weak_ptr<MpvPlayer> weak = weak_from_this();
     core_->setEventHandler([weak](const mpv_event& event) {
         if (auto self = weak.lock())
             self->handleEvent(event);
     });
 }
 
-void Player::replaceCurrentItemWithPlayerItem(std::shared_ptr<PlayerItem> item) {
+void MpvPlayer::replaceCurrentItemWithPlayerItem(std::shared_ptr<PlayerItem> anyItem) {
+    std::shared_ptr<MpvPlayerItem> item = std::dynamic_pointer_cast<MpvPlayerItem>(anyItem);
+    if (anyItem && !item) {
+        logError(QStringLiteral("player: an item of another kind cannot be played here"));
+        return;
+    }
     if (item && item == item_)
         return;
     if (item) {
-        const std::shared_ptr<Player> owner = item->player_.lock();
+        const std::shared_ptr<MpvPlayer> owner = item->player_.lock();
         if (owner && owner.get() != this && owner->currentItem() == item) {
             logError(QStringLiteral("player: an item cannot be in two players"));
             return;
@@ -117,7 +133,7 @@ void Player::replaceCurrentItemWithPlayerItem(std::shared_ptr<PlayerItem> item) 
     });
 }
 
-void Player::load(std::uint64_t generation) {
+void MpvPlayer::load(std::uint64_t generation) {
     if (generation != generation_ || !item_)
         return;
     if (!core_) {
@@ -145,7 +161,7 @@ void Player::load(std::uint64_t generation) {
     core_->command({"loadfile", hostPath.toUtf8(), "replace"}, kLoadReplyBase + generation_);
 }
 
-void Player::failItem(ErrorPtr error) {
+void MpvPlayer::failItem(ErrorPtr error) {
     if (!error)
         error = makeError(-EINVAL, mediaErrorDomain(), QStringLiteral("the item cannot be played"));
     logError(QStringLiteral("player: item failed: %1").arg(error->message()));
@@ -158,15 +174,7 @@ void Player::failItem(ErrorPtr error) {
         item_->setStatus(PlayerItem::Status::Failed, std::move(error));
 }
 
-void Player::play() {
-    setRate(1.0f);
-}
-
-void Player::pause() {
-    setRate(0.0f);
-}
-
-void Player::setRate(float rate) {
+void MpvPlayer::setRate(float rate) {
     if (!(rate >= 0.0f)) {
         logError(QStringLiteral("player: rate %1 is not supported").arg(double(rate)));
         return;
@@ -198,7 +206,7 @@ void Player::setRate(float rate) {
     }
 }
 
-MediaTime Player::currentTime() const {
+MediaTime MpvPlayer::currentTime() const {
     if (!item_)
         return MediaTime::invalid();
     const std::int32_t timescale = item_->timescale();
@@ -213,19 +221,12 @@ MediaTime Player::currentTime() const {
     return MediaTime::fromSeconds(seconds, timescale);
 }
 
-void Player::seekToTime(const MediaTime& time) {
+void MpvPlayer::seekToTime(const MediaTime& time) {
     // libmpv's plain absolute seek decodes up to the frame at the time.
     seek(time, "absolute", {});
 }
 
-void Player::seekToTime_toleranceBefore_toleranceAfter(const MediaTime& time,
-                                                       const MediaTime& toleranceBefore,
-                                                       const MediaTime& toleranceAfter) {
-    seekToTime_toleranceBefore_toleranceAfter_completionHandler(time, toleranceBefore,
-                                                                toleranceAfter, {});
-}
-
-void Player::seekToTime_toleranceBefore_toleranceAfter_completionHandler(
+void MpvPlayer::seekToTime_toleranceBefore_toleranceAfter_completionHandler(
     const MediaTime& time, const MediaTime& toleranceBefore, const MediaTime& toleranceAfter,
     SeekCompletion completion) {
     const bool exact = toleranceBefore == MediaTime::zero() && toleranceAfter == MediaTime::zero();
@@ -238,7 +239,7 @@ void Player::seekToTime_toleranceBefore_toleranceAfter_completionHandler(
          std::move(completion));
 }
 
-void Player::seek(const MediaTime& time, const QByteArray& mode, SeekCompletion completion) {
+void MpvPlayer::seek(const MediaTime& time, const QByteArray& mode, SeekCompletion completion) {
     if (!time.isNumeric() || !item_ || item_->status() == PlayerItem::Status::Failed) {
         if (completion)
             MainQueue::async([completion] { completion(false); });
@@ -258,7 +259,7 @@ void Player::seek(const MediaTime& time, const QByteArray& mode, SeekCompletion 
         issueSeek();
 }
 
-void Player::issueSeek() {
+void MpvPlayer::issueSeek() {
     if (!core_)
         return;
     seek_.issued = true;
@@ -268,7 +269,7 @@ void Player::issueSeek() {
                    kSeekReply);
 }
 
-void Player::finishSeeks(bool finished) {
+void MpvPlayer::finishSeeks(bool finished) {
     if (!finished) {
         seek_.pending = false;
         seek_.issued = false;

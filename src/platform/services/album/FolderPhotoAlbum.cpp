@@ -1,4 +1,4 @@
-#include "PhotoAlbum.h"
+#include "FolderPhotoAlbum.h"
 
 #include "platform/media/Asset.h"
 #include "platform/runtime/DevicePaths.h"
@@ -91,7 +91,21 @@ QString candidateName(const QFileInfo& source, int attempt) {
 
 } // namespace
 
+Implementation<PhotoAlbum::Maker>& PhotoAlbum::implementation() {
+    static Implementation<Maker> chosen([]() -> std::shared_ptr<PhotoAlbum> {
+        // One album for the process: made on first use, where the user's
+        // Videos are then.
+        static const std::shared_ptr<PhotoAlbum> shared = FolderPhotoAlbum::inUsersVideos();
+        return shared;
+    });
+    return chosen;
+}
+
 std::shared_ptr<PhotoAlbum> PhotoAlbum::sharedAlbum() {
+    return implementation().make();
+}
+
+std::shared_ptr<FolderPhotoAlbum> FolderPhotoAlbum::inUsersVideos() {
     QString folder = qEnvironmentVariable("TAMSEL_ALBUM_DIR");
     if (folder.isEmpty()) {
         QString videos = QStandardPaths::writableLocation(QStandardPaths::MoviesLocation);
@@ -99,17 +113,17 @@ std::shared_ptr<PhotoAlbum> PhotoAlbum::sharedAlbum() {
             videos = QDir::homePath() + QStringLiteral("/Videos");
         folder = videos + QStringLiteral("/Screen Recordings");
     }
-    return std::make_shared<PhotoAlbum>(folder);
+    return std::make_shared<FolderPhotoAlbum>(folder);
 }
 
-PhotoAlbum::PhotoAlbum(QString folderHostPath) : folder_(std::move(folderHostPath)) {}
+FolderPhotoAlbum::FolderPhotoAlbum(QString folderHostPath) : folder_(std::move(folderHostPath)) {}
 
-QString PhotoAlbum::lastSavedPath() const {
+QString FolderPhotoAlbum::lastSavedPath() const {
     std::lock_guard lock(lastSavedMutex);
     return *lastSaved_;
 }
 
-QString PhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error) {
+QString FolderPhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error) {
     const QString source = DevicePaths::toHost(devicePath);
     const auto asset = Asset::assetWithURL(QUrl::fromLocalFile(source));
     if (asset->tracksWithMediaType(MediaType::Video).isEmpty() || !asset->isPlayable()) {
@@ -185,8 +199,8 @@ QString PhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error) {
     return {};
 }
 
-void PhotoAlbum::performChanges_creationRequestForAssetFromVideoAtFileURL(const QUrl& fileURL,
-                                                                          Completion completion) {
+void FolderPhotoAlbum::performChanges_creationRequestForAssetFromVideoAtFileURL(
+    const QUrl& fileURL, Completion completion) {
     GlobalQueue::async(QueuePriority::Default, [album = *this, fileURL,
                                                 completion = std::move(completion)]() mutable {
         ErrorPtr error;
@@ -197,7 +211,7 @@ void PhotoAlbum::performChanges_creationRequestForAssetFromVideoAtFileURL(const 
     });
 }
 
-void PhotoAlbum::saveVideoAtPathToAlbum(const QString& path) {
+void FolderPhotoAlbum::saveVideoAtPathToAlbum(const QString& path) {
     GlobalQueue::async(QueuePriority::Default, [album = *this, path]() mutable {
         ErrorPtr error;
         if (album.importVideo(path, &error).isEmpty())

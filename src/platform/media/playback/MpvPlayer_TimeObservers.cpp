@@ -1,6 +1,6 @@
 // Periodic and boundary time observers.
 
-#include "Player_Internal.h"
+#include "MpvPlayer_Internal.h"
 #include "platform/runtime/Log.h"
 #include "platform/runtime/MainQueue.h"
 
@@ -9,7 +9,7 @@
 
 namespace platform {
 
-TimeObserverToken Player::addPeriodicTimeObserverForInterval_queue_usingBlock(
+TimeObserverToken MpvPlayer::addPeriodicTimeObserverForInterval_queue_usingBlock(
     const MediaTime& interval, ObserverQueue queue, std::function<void(MediaTime)> block) {
     const double seconds = interval.seconds();
     if (!block || !interval.isNumeric() || !(seconds > 0)) {
@@ -42,7 +42,7 @@ TimeObserverToken Player::addPeriodicTimeObserverForInterval_queue_usingBlock(
     return token;
 }
 
-TimeObserverToken Player::addBoundaryTimeObserverForTimes_queue_usingBlock(
+TimeObserverToken MpvPlayer::addBoundaryTimeObserverForTimes_queue_usingBlock(
     const QList<MediaTime>& times, ObserverQueue queue, std::function<void()> block) {
     BoundaryObserver observer{nextObserverId_++,
                               std::make_shared<std::atomic_bool>(true),
@@ -62,7 +62,7 @@ TimeObserverToken Player::addBoundaryTimeObserverForTimes_queue_usingBlock(
     return {boundaries_.back().id};
 }
 
-void Player::removeTimeObserver(TimeObserverToken token) {
+void MpvPlayer::removeTimeObserver(TimeObserverToken token) {
     if (!token)
         return;
     std::erase_if(periodic_, [&](const auto& o) {
@@ -79,7 +79,7 @@ void Player::removeTimeObserver(TimeObserverToken token) {
     });
 }
 
-void Player::run(const ObserverQueue& queue, const Liveness& alive, std::function<void()> job) {
+void MpvPlayer::run(const ObserverQueue& queue, const Liveness& alive, std::function<void()> job) {
     // Always queued, never called from inside the player's own work, so a
     // block may do anything with the player, including dropping it.
     auto guarded = [alive, job = std::move(job)] {
@@ -92,7 +92,7 @@ void Player::run(const ObserverQueue& queue, const Liveness& alive, std::functio
         MainQueue::async(std::move(guarded));
 }
 
-void Player::updateClock() {
+void MpvPlayer::updateClock() {
     const bool running = rate_ > 0 && item_ && loaded_ && !endReached_ &&
                          item_->status() == PlayerItem::Status::ReadyToPlay;
     for (const auto& observer : periodic_) {
@@ -106,7 +106,7 @@ void Player::updateClock() {
     }
 }
 
-void Player::firePeriodicObservers() {
+void MpvPlayer::firePeriodicObservers() {
     if (!item_)
         return;
     const MediaTime time = currentTime();
@@ -114,7 +114,7 @@ void Player::firePeriodicObservers() {
         run(observer->queue, observer->alive, [block = observer->block, time] { block(time); });
 }
 
-void Player::fireBoundaries(double from, double to, bool inclusiveEnd) {
+void MpvPlayer::fireBoundaries(double from, double to, bool inclusiveEnd) {
     // A time fires when playback passes it: from < t <= to; at the end of
     // the item every time still ahead fires.
     for (const BoundaryObserver& observer : boundaries_) {

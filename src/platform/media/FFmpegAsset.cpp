@@ -1,4 +1,4 @@
-#include "Asset.h"
+#include "FFmpegAsset.h"
 
 #include "FFmpegHandles.h"
 #include "StreamTime.h"
@@ -36,8 +36,18 @@ double frameRateOf(const AVStream* stream) {
 
 } // namespace
 
+Implementation<Asset::Maker>& Asset::implementation() {
+    static Implementation<Maker> chosen(
+        [](const QUrl& url) -> std::shared_ptr<Asset> { return FFmpegAsset::open(url); });
+    return chosen;
+}
+
 std::shared_ptr<Asset> Asset::assetWithURL(const QUrl& url) {
-    std::shared_ptr<Asset> asset(new Asset);
+    return implementation().make(url);
+}
+
+std::shared_ptr<FFmpegAsset> FFmpegAsset::open(const QUrl& url) {
+    std::shared_ptr<FFmpegAsset> asset(new FFmpegAsset);
     asset->url_ = url;
     asset->hostPath_ = DevicePaths::hostPathOfUrl(url);
     const QString shownPath = url.isLocalFile() ? url.toLocalFile() : url.toString();
@@ -97,31 +107,22 @@ std::shared_ptr<Asset> Asset::assetWithURL(const QUrl& url) {
     return asset;
 }
 
-const QUrl& Asset::url() const {
+const QUrl& FFmpegAsset::url() const {
     return url_;
 }
-const QString& Asset::hostPath() const {
+const QString& FFmpegAsset::hostPath() const {
     return hostPath_;
 }
-QList<AssetTrack> Asset::tracks() const {
+QList<AssetTrack> FFmpegAsset::tracks() const {
     return tracks_;
 }
-
-QList<AssetTrack> Asset::tracksWithMediaType(MediaType type) const {
-    QList<AssetTrack> matching;
-    for (const AssetTrack& track : tracks_)
-        if (track.mediaType == type)
-            matching.append(track);
-    return matching;
-}
-
-MediaTime Asset::duration() const {
+MediaTime FFmpegAsset::duration() const {
     return duration_;
 }
-bool Asset::isPlayable() const {
+bool FFmpegAsset::isPlayable() const {
     return playable_;
 }
-ErrorPtr Asset::error() const {
+ErrorPtr FFmpegAsset::error() const {
     return error_;
 }
 
