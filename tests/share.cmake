@@ -20,3 +20,15 @@ tamsel_add_tests(tamsel_share_sheet_tests unit
   SOURCES share/ActivitySheetTest.cpp share/BuiltInActivitiesTest.cpp share/ShareStringsTest.cpp
   LIBS tamsel_share_test_support Qt6::Test
   MAIN tamsel_ui_test_main)
+
+tamsel_add_tests(tamsel_editor_share_tests integration
+  SOURCES share/EditorShareTest.cpp editor/EditorFixture.cpp
+  LIBS tamsel_share_test_support tamsel_editor tamsel_media_generator
+  MAIN tamsel_ui_test_main)
+
+tamsel_add_tests(tamsel_share_end_to_end_tests integration
+  SOURCES share/ShareEndToEndTest.cpp editor/EndToEndFixture.cpp
+  LIBS tamsel_share_test_support tamsel_platform_media tamsel_media_generator)
+add_dependencies(tamsel_share_end_to_end_tests tamsel-edit tamsel-video-editor)
+target_compile_definitions(tamsel_share_end_to_end_tests PRIVATE
+  TAMSEL_SHARE_TEST_DIR="${CMAKE_CURRENT_SOURCE_DIR}/share")
