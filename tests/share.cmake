@@ -5,6 +5,7 @@ find_package(Qt6 REQUIRED COMPONENTS Network Test Widgets)
 # Doubles of the share services; never linked into the product.
 add_library(tamsel_share_test_support STATIC
   share/LocalHttpServer.cpp
+  share/PrivateSessionBus.cpp
   share/ShareFakes.cpp
 )
 target_include_directories(tamsel_share_test_support PUBLIC ${CMAKE_CURRENT_SOURCE_DIR}/share)
@@ -18,6 +19,7 @@ tamsel_add_tests(tamsel_store_tests unit
 
 tamsel_add_tests(tamsel_share_sheet_tests unit
   SOURCES share/ActivitySheetTest.cpp share/BuiltInActivitiesTest.cpp share/ShareStringsTest.cpp
+    share/DesktopServiceFakesTest.cpp
   LIBS tamsel_share_test_support Qt6::Test
   MAIN tamsel_ui_test_main)
 
