@@ -3,6 +3,7 @@
 
 #include "platform/ui/share/ActivitySheet.h"
 #include "ShareFakes.h"
+#include "platform/runtime/MainQueue.h"
 #include "platform/services/ActivityTypes.h"
 #include "platform/ui/Toolbar.h"
 #include "platform/ui/ToolbarItem.h"
@@ -34,6 +35,9 @@ class ActivitySheetTest : public ::testing::Test {
         window.show();
         waitUntil([&] { return root->appearance() == ViewController::Appearance::Appeared; });
     }
+    // A sheet lets itself go on the main queue once it has reported; that
+    // must run before the application object goes.
+    void TearDown() override { MainQueue::runPending(); }
 
     std::shared_ptr<FakeActivity> builtIn(const QString& type, bool canPerform = true) {
         auto activity = std::make_shared<FakeActivity>(type, type.section('.', -1), canPerform);

@@ -112,7 +112,7 @@ TEST_F(ShareEndToEnd, ACancelledSheetAddsNothing) {
     const Run cancelled = edit(R"(
 wait ready
 tap shareButton
-sleep 1.5
+sleep 3
 dump
 share cancel
 dump
