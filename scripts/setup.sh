@@ -10,7 +10,7 @@ packages=(
   libavformat-dev libavcodec-dev libavutil-dev libswscale-dev libswresample-dev
   libmpv-dev libappstream-dev
   libgtest-dev libgmock-dev libbenchmark-dev
-  xvfb xauth ffmpeg
+  xvfb xauth ffmpeg dbus-daemon
   libgl1-mesa-dri libegl1 fonts-dejavu-core adwaita-icon-theme
 )
 

@@ -4,10 +4,13 @@
 #include "overlay/TXVideoOverlayButton.h"
 #include "platform/runtime/Log.h"
 #include "platform/ui/ViewAlpha.h"
+#include "platform/ui/share/ActivitySheet.h"
 
 #include <QApplication>
 #include <QDeadlineTimer>
 #include <QJsonDocument>
+#include <QKeyEvent>
+#include <QListWidget>
 #include <QMouseEvent>
 #include <QTimer>
 #include <cstdio>
@@ -22,10 +25,13 @@ void sendMouse(QWidget* widget, QEvent::Type type, const QPointF& local, Qt::Mou
     QApplication::sendEvent(widget, &event);
 }
 
+void click(QWidget* widget, const QPointF& at) {
+    sendMouse(widget, QEvent::MouseButtonPress, at, Qt::LeftButton);
+    sendMouse(widget, QEvent::MouseButtonRelease, at, Qt::NoButton);
+}
+
 void click(QWidget* widget) {
-    const QPointF centre = QRectF(widget->rect()).center();
-    sendMouse(widget, QEvent::MouseButtonPress, centre, Qt::LeftButton);
-    sendMouse(widget, QEvent::MouseButtonRelease, centre, Qt::NoButton);
+    click(widget, QRectF(widget->rect()).center());
 }
 
 // A widget the user can see and reach: shown, and not faded out.
@@ -119,6 +125,9 @@ void AutomationDriver::runNext() {
     case AutomationCommand::Kind::Wait:
         wait(c);
         return;
+    case AutomationCommand::Kind::Share:
+        retry([this, target = c.target] { return share(target); }, c.timeout);
+        return;
     }
     if (!failure.isEmpty()) {
         finish(failure);
@@ -184,6 +193,70 @@ QString AutomationDriver::drag(const QString& part, double seconds) {
                   Qt::LeftButton);
     sendMouse(scrubber, QEvent::MouseButtonRelease, QPointF(toX, y), Qt::NoButton);
     return QString();
+}
+
+QString AutomationDriver::share(const QString& typeOrTitle) {
+    TXVideoEditorViewController* e = editor();
+    auto* sheet = e ? dynamic_cast<ActivityViewController*>(e->presentedViewController()) : nullptr;
+    if (!sheet || sheet->hasReported())
+        return QStringLiteral("no share sheet is open (tap shareButton first)");
+    auto* real = dynamic_cast<ActivitySheet*>(sheet);
+    QListWidget* list = real ? real->activityList() : nullptr;
+    if (typeOrTitle == QLatin1String("cancel")) {
+        if (list && reachable(list)) {
+            QKeyEvent press(QEvent::KeyPress, Qt::Key_Escape, Qt::NoModifier);
+            QApplication::sendEvent(list, &press);
+        } else {
+            sheet->cancel();
+        }
+        return QString();
+    }
+    std::shared_ptr<Activity> picked;
+    QStringList offered;
+    for (const auto& activity : sheet->offeredActivities()) {
+        offered.append(activity->activityType());
+        if (!picked && (activity->activityType() == typeOrTitle ||
+                        activity->activityTitle().compare(typeOrTitle, Qt::CaseInsensitive) == 0))
+            picked = activity;
+    }
+    if (!picked)
+        return QStringLiteral("the sheet offers no %1 (it offers %2)")
+            .arg(typeOrTitle, offered.join(QStringLiteral(", ")));
+    if (list && reachable(list)) {
+        for (int row = 0; row < list->count(); ++row) {
+            QListWidgetItem* item = list->item(row);
+            if (item->data(Qt::UserRole).toString() != picked->activityType())
+                continue;
+            list->scrollToItem(item);
+            click(list->viewport(), QRectF(list->visualItemRect(item)).center());
+            return QString();
+        }
+        return QStringLiteral("%1 is offered but not listed yet").arg(typeOrTitle);
+    }
+    sheet->performActivityNamed(picked->activityType());
+    return QString();
+}
+
+void AutomationDriver::retry(std::function<QString()> attempt, double timeout) {
+    retrying_ = std::move(attempt);
+    waitDeadline_ = QDeadlineTimer(qint64(timeout * 1000));
+    pollRetry();
+}
+
+void AutomationDriver::pollRetry() {
+    if (done_)
+        return;
+    const QString why = retrying_();
+    if (why.isEmpty()) {
+        ++next_;
+        QTimer::singleShot(0, this, &AutomationDriver::runNext);
+        return;
+    }
+    if (waitDeadline_.hasExpired()) {
+        finish(why);
+        return;
+    }
+    QTimer::singleShot(20, this, &AutomationDriver::pollRetry);
 }
 
 bool AutomationDriver::holds(const AutomationCommand& c) {

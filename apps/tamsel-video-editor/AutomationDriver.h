@@ -6,6 +6,7 @@
 #include <QDeadlineTimer>
 #include <QObject>
 #include <QStringList>
+#include <functional>
 #include <mutex>
 
 // Runs an automation script against the editor of an extension request, one
@@ -34,9 +35,17 @@ class AutomationDriver : public QObject {
     // Each returns an empty string on success, else why it failed.
     QString tap(const QString& name);
     QString drag(const QString& part, double seconds);
+    // Picks an activity in the open share sheet, or cancels the sheet, as
+    // the user would: a click on its row, the Escape key.
+    QString share(const QString& typeOrTitle);
     // Polls the condition until it holds or the timeout passes.
     void wait(const AutomationCommand& command);
     void pollWait();
+    // Tries `attempt` (empty result: done, else why not yet) until it
+    // succeeds or `timeout` seconds pass, then goes on with the next command
+    // or fails with the last reason.
+    void retry(std::function<QString()> attempt, double timeout);
+    void pollRetry();
     bool holds(const AutomationCommand& command);
 
     ExtensionEntry& entry_;
@@ -46,6 +55,7 @@ class AutomationDriver : public QObject {
     bool done_ = false;
     AutomationCommand waiting_;
     QDeadlineTimer waitDeadline_;
+    std::function<QString()> retrying_;
 
     // Every log line since the driver was made; `wait log` consumes them in
     // order.

@@ -80,6 +80,14 @@ std::optional<QList<AutomationCommand>> parseAutomationScript(const QString& tex
             c.kind = verb == QLatin1String("shake")  ? AutomationCommand::Kind::Shake
                      : verb == QLatin1String("dump") ? AutomationCommand::Kind::Dump
                                                      : AutomationCommand::Kind::Dismiss;
+        } else if (verb == QLatin1String("share")) {
+            // The sheet comes once the store has answered: the command waits
+            // for it, and for the activity to be offered.
+            if (w.size() != 2)
+                return fail(QStringLiteral("share takes an activity type or title, or cancel"));
+            c.kind = AutomationCommand::Kind::Share;
+            c.target = w[1];
+            c.timeout = 10;
         } else if (verb == QLatin1String("screenshot")) {
             if (w.size() != 2)
                 return fail(QStringLiteral("screenshot takes a file name"));

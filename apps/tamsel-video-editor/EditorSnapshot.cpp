@@ -1,5 +1,7 @@
 #include "EditorSnapshot.h"
 
+#include "platform/ui/share/ActivityViewController.h"
+
 #include <QJsonArray>
 #include <cmath>
 
@@ -34,6 +36,22 @@ QJsonArray itemNames(TXVideoEditorViewController& editor, const platform::Toolba
     for (const auto& item : bar->items())
         names.append(nameOfItem(editor, item.get()));
     return names;
+}
+
+// The open share sheet: what it offers, in order, and its items as text.
+QJsonValue shareSheet(TXVideoEditorViewController& editor) {
+    auto* sheet = dynamic_cast<platform::ActivityViewController*>(editor.presentedViewController());
+    if (!sheet || sheet->hasReported())
+        return QJsonValue::Null;
+    QJsonArray offered;
+    for (const auto& activity : sheet->offeredActivities())
+        offered.append(activity->activityType());
+    return QJsonObject{
+        {QStringLiteral("activityTypes"), offered},
+        {QStringLiteral("items"),
+         QJsonArray::fromStringList(
+             platform::ActivityViewController::describeItems(sheet->activityItems()))},
+    };
 }
 
 } // namespace
@@ -71,6 +89,7 @@ QJsonObject dump(TXVideoEditorViewController& editor) {
         {QStringLiteral("bottomToolBar"),
          bottomInView ? itemNames(editor, editor.bottomToolBar.get()) : QJsonArray()},
         {QStringLiteral("activityTypes"), QJsonArray::fromStringList(editor.activityTypes)},
+        {QStringLiteral("shareSheet"), shareSheet(editor)},
     };
 }
 

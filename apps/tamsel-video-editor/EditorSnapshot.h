@@ -17,7 +17,9 @@ std::shared_ptr<platform::ToolbarItem> itemNamed(TXVideoEditorViewController& ed
 QString nameOfItem(TXVideoEditorViewController& editor, const platform::ToolbarItem* item);
 // introMode, trimming, exporting, scrubbing, hasEdit, padMode, uiHidden,
 // editStartTime, editEndTime, currentTime, videoURL, topToolBar,
-// bottomToolBar (empty when it is not in the view), activityTypes.
+// bottomToolBar (empty when it is not in the view), activityTypes,
+// shareSheet (null, or the open sheet's offered activity types in order and
+// its items as text).
 QJsonObject dump(TXVideoEditorViewController& editor);
 
 } // namespace EditorSnapshot

@@ -45,3 +45,18 @@ TEST(AutomationScript, RefusesAnythingElseNamingTheLine) {
         EXPECT_TRUE(error.startsWith("line 2: ")) << line << " " << error.toStdString();
     }
 }
+
+TEST(AutomationScript, ShareNamesAnActivityByTypeOrQuotedTitleOrCancels) {
+    QString error;
+    const auto script = parseAutomationScript(
+        "share org.tamsel.activity.Mail\nshare \"Save to Files…\"\nshare cancel\n", &error);
+    ASSERT_TRUE(script) << error.toStdString();
+    ASSERT_EQ(script->size(), 3);
+    EXPECT_EQ((*script)[0].kind, Kind::Share);
+    EXPECT_EQ((*script)[0].target, "org.tamsel.activity.Mail");
+    EXPECT_EQ((*script)[1].target, "Save to Files…");
+    EXPECT_EQ((*script)[2].target, "cancel");
+    EXPECT_GT((*script)[0].timeout, 0) << "it waits for the sheet";
+    EXPECT_FALSE(parseAutomationScript("share\n", &error));
+    EXPECT_FALSE(parseAutomationScript("share Mail now\n", &error));
+}
