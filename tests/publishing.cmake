@@ -1,0 +1,23 @@
+# The YouTube publishing plug-in: loaded as the editor loads it; its upload
+# client and sign-in against the local fake of the service; its form; the
+# refresh token in a real keyring; a screenshot of the form under Xvfb.
+if(NOT TARGET tamsel_fake_youtube)
+  add_subdirectory(${CMAKE_CURRENT_SOURCE_DIR}/publishing/server
+                   ${CMAKE_CURRENT_BINARY_DIR}/publishing-server)
+endif()
+
+# A plug-in built for another ABI version, for the loader to refuse.
+add_library(tamsel-wrong-abi-plugin MODULE publishing/WrongAbiPlugin.cpp)
+target_include_directories(tamsel-wrong-abi-plugin PRIVATE ${PROJECT_SOURCE_DIR}/src)
+target_link_libraries(tamsel-wrong-abi-plugin PRIVATE Qt6::Core tamsel_warnings)
+set_target_properties(tamsel-wrong-abi-plugin PROPERTIES CXX_VISIBILITY_PRESET hidden)
+
+# Loads the built plug-in through the loader, as the editor does.
+tamsel_add_tests(tamsel_publishing_plugin_tests integration
+  SOURCES publishing/PluginLoadTest.cpp
+  LIBS tamsel_platform_publishing Qt6::Widgets
+  MAIN tamsel_ui_test_main)
+tamsel_host_publishing_plugins(tamsel_publishing_plugin_tests)
+add_dependencies(tamsel_publishing_plugin_tests tamsel-youtube-publishing tamsel-wrong-abi-plugin)
+target_compile_definitions(tamsel_publishing_plugin_tests PRIVATE
+  TAMSEL_WRONG_ABI_PLUGIN="$<TARGET_FILE:tamsel-wrong-abi-plugin>")
