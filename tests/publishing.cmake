@@ -21,3 +21,19 @@ tamsel_host_publishing_plugins(tamsel_publishing_plugin_tests)
 add_dependencies(tamsel_publishing_plugin_tests tamsel-youtube-publishing tamsel-wrong-abi-plugin)
 target_compile_definitions(tamsel_publishing_plugin_tests PRIVATE
   TAMSEL_WRONG_ABI_PLUGIN="$<TARGET_FILE:tamsel-wrong-abi-plugin>")
+
+# The plug-in's sign-in and upload client against the local fake service.
+add_library(tamsel_publishing_test_support STATIC
+  publishing/FakeBrowser.cpp
+  publishing/ServerFixture.cpp)
+target_include_directories(tamsel_publishing_test_support PUBLIC ${CMAKE_CURRENT_SOURCE_DIR}/publishing)
+target_link_libraries(tamsel_publishing_test_support
+  PUBLIC tamsel_fake_youtube tamsel_youtube_publishing_objects tamsel_platform_publishing
+         tamsel_test_support Qt6::Network
+  PRIVATE tamsel_warnings)
+
+tamsel_add_tests(tamsel_publishing_service_tests integration
+  SOURCES
+    publishing/UploadClientTest.cpp
+    publishing/SignInTest.cpp
+  LIBS tamsel_publishing_test_support)

@@ -26,7 +26,13 @@ QString LoopbackReplyHandler::callback() const {
 void LoopbackReplyHandler::networkReplyFinished(QNetworkReply* reply) {
     const int status = reply->attribute(QNetworkRequest::HttpStatusCodeAttribute).toInt();
     if (reply->error() == QNetworkReply::NoError && status < 400) {
-        QOAuthHttpServerReplyHandler::networkReplyFinished(reply);
+        if (!reply->header(QNetworkRequest::ContentTypeHeader).isNull()) {
+            QOAuthHttpServerReplyHandler::networkReplyFinished(reply);
+            return;
+        }
+        // Qt would drop an answer without a type and keep the sign-in waiting.
+        emit tokenRequestFailed(PublishingError::make(
+            PublishingError::SignInFailed, QStringLiteral("Google's sign-in answered oddly")));
         return;
     }
     const QJsonObject answer = QJsonDocument::fromJson(reply->readAll()).object();

@@ -312,7 +312,9 @@ void YouTubeResumableUploadClient::received(Step step, QNetworkReply* reply) {
             return;
         }
         const qint64 held = heldBytes(reply);
-        if (held > t.held || step == Step::QueryStatus)
+        // Only bytes the server did not hold before are progress; an answer
+        // alone is not, or a server that keeps failing would be tried for ever.
+        if (held > t.held)
             t.failures = 0;
         t.held = std::min(held, t.total);
         reportProgress(t.held);

@@ -268,7 +268,10 @@ class FakeYouTubeServer::Worker : public QObject {
         }
         QByteArray head = "HTTP/1.1 " + QByteArray::number(response.status) + ' ' +
                           reason(response.status) + "\r\n";
-        head += "Content-Type: " + response.contentType + "\r\n";
+        head += "Content-Type: " +
+                (response.contentType.isEmpty() ? QByteArray("application/json; charset=UTF-8")
+                                                : response.contentType) +
+                "\r\n";
         head += "Content-Length: " + QByteArray::number(response.body.size()) + "\r\n";
         for (const auto& [name, value] : response.headers)
             head += name + ": " + value + "\r\n";
