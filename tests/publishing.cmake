@@ -37,3 +37,17 @@ tamsel_add_tests(tamsel_publishing_service_tests integration
     publishing/UploadClientTest.cpp
     publishing/SignInTest.cpp
   LIBS tamsel_publishing_test_support)
+
+# The refresh token in a real Secret Service: a GNOME keyring in a private
+# session bus, started by with-keyring.sh around the test.
+find_program(TAMSEL_DBUS_RUN_SESSION dbus-run-session)
+find_program(TAMSEL_GNOME_KEYRING_DAEMON gnome-keyring-daemon)
+if(TAMSEL_DBUS_RUN_SESSION AND TAMSEL_GNOME_KEYRING_DAEMON)
+  add_executable(tamsel_publishing_keyring_tests publishing/KeyringTest.cpp)
+  target_link_libraries(tamsel_publishing_keyring_tests PRIVATE
+    tamsel_test_main tamsel_publishing_test_support tamsel_warnings)
+  add_test(NAME publishing_keyring
+    COMMAND ${CMAKE_CURRENT_SOURCE_DIR}/publishing/with-keyring.sh
+            $<TARGET_FILE:tamsel_publishing_keyring_tests>)
+  set_tests_properties(publishing_keyring PROPERTIES LABELS integration TIMEOUT 120)
+endif()
