@@ -51,3 +51,13 @@ if(TAMSEL_DBUS_RUN_SESSION AND TAMSEL_GNOME_KEYRING_DAEMON)
             $<TARGET_FILE:tamsel_publishing_keyring_tests>)
   set_tests_properties(publishing_keyring PROPERTIES LABELS integration TIMEOUT 120)
 endif()
+
+# The agent and its form against fakes of the sign-in and the upload client;
+# the limits on a video's text.
+tamsel_add_tests(tamsel_publishing_unit_tests unit
+  SOURCES
+    publishing/AgentTest.cpp
+    publishing/FakePublishingServices.cpp
+    publishing/VideoMetadataTest.cpp
+  LIBS tamsel_youtube_publishing_objects tamsel_platform_publishing Qt6::Widgets
+  MAIN tamsel_ui_test_main)

@@ -10,6 +10,7 @@
 #include "platform/runtime/Log.h"
 #include "platform/ui/NavigationController.h"
 
+#include <QDir>
 #include <QLocale>
 
 using platform::ErrorPtr;
@@ -80,6 +81,12 @@ void YouTubePublishingAgent::setMediaPath(const QString& path) {
 
 std::shared_ptr<platform::NavigationController> YouTubePublishingAgent::navigationController() {
     return navigation_;
+}
+
+QString YouTubePublishingAgent::mediaHostPath() const {
+    // The temporary store's names hold a double slash; the file is the same.
+    const QString host = platform::DevicePaths::toHost(mediaPath_);
+    return host.isEmpty() ? host : QDir::cleanPath(host);
 }
 
 void YouTubePublishingAgent::formAboutToShow() {
@@ -210,7 +217,7 @@ void YouTubePublishingAgent::ensureSignedIn() {
 void YouTubePublishingAgent::waitForMedia() {
     form_->setStatus(localized("STATUS_WAITING", "Getting the video ready…"));
     form_->setProgress(0, -1);
-    const QString hostPath = platform::DevicePaths::toHost(mediaPath_);
+    const QString hostPath = mediaHostPath();
     if (hostPath.isEmpty()) {
         endPublishing(PublishingError::make(PublishingError::MediaUnreadable,
                                             QStringLiteral("There is no video to publish")));
@@ -228,7 +235,7 @@ void YouTubePublishingAgent::waitForMedia() {
 }
 
 void YouTubePublishingAgent::startUpload() {
-    upload_.filePath = platform::DevicePaths::toHost(mediaPath_);
+    upload_.filePath = mediaHostPath();
     platform::logDefault(QStringLiteral("YouTube publishing: uploading %1").arg(mediaPath_));
     form_->setStatus(localized("STATUS_UPLOADING_START", "Uploading…"));
     form_->setProgress(0, 1);

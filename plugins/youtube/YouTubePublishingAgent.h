@@ -48,6 +48,7 @@ class YouTubePublishingAgent : public platform::PublishingAgent {
     void signOutFromForm();
     void publish();
     void ensureSignedIn();
+    QString mediaHostPath() const;
     void waitForMedia();
     void startUpload();
     void endPublishing(const platform::ErrorPtr& error);
