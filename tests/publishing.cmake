@@ -25,6 +25,7 @@ target_compile_definitions(tamsel_publishing_plugin_tests PRIVATE
 # The plug-in's sign-in and upload client against the local fake service.
 add_library(tamsel_publishing_test_support STATIC
   publishing/FakeBrowser.cpp
+  publishing/FakePublishingServices.cpp
   publishing/ServerFixture.cpp)
 target_include_directories(tamsel_publishing_test_support PUBLIC ${CMAKE_CURRENT_SOURCE_DIR}/publishing)
 target_link_libraries(tamsel_publishing_test_support
@@ -57,7 +58,22 @@ endif()
 tamsel_add_tests(tamsel_publishing_unit_tests unit
   SOURCES
     publishing/AgentTest.cpp
-    publishing/FakePublishingServices.cpp
     publishing/VideoMetadataTest.cpp
-  LIBS tamsel_youtube_publishing_objects tamsel_platform_publishing Qt6::Widgets
+  LIBS tamsel_publishing_test_support Qt6::Widgets
   MAIN tamsel_ui_test_main)
+
+# The form under Xvfb, pre-filled and publishing under the progress overlay.
+find_program(TAMSEL_XVFB_RUN xvfb-run)
+add_executable(tamsel-publishing-screenshots publishing/FormScreenshots.cpp)
+target_link_libraries(tamsel-publishing-screenshots PRIVATE
+  tamsel_publishing_test_support tamsel_youtube tamsel_warnings)
+add_dependencies(tamsel-publishing-screenshots tamsel_resources)
+if(TAMSEL_XVFB_RUN)
+  tamsel_add_tests(tamsel_publishing_screenshot_tests integration
+    SOURCES publishing/FormScreenshotTest.cpp
+    MAIN tamsel_ui_test_main)
+  target_compile_definitions(tamsel_publishing_screenshot_tests PRIVATE
+    TAMSEL_SCREENSHOTS="$<TARGET_FILE:tamsel-publishing-screenshots>"
+    TAMSEL_XVFB_RUN="${TAMSEL_XVFB_RUN}")
+  add_dependencies(tamsel_publishing_screenshot_tests tamsel-publishing-screenshots)
+endif()
