@@ -27,9 +27,9 @@ class YouTubeResumableUploadClient : public platform::YouTubeUploadClient {
     Q_OBJECT
   public:
     struct Policy {
-        qint64 chunkSize = 8 * 1024 * 1024; // rounded down to whole 256 KiB units
-        int maxAttempts = 8;                // failures in a row without progress before giving up
-        int firstRetryDelayMs = 1000;       // doubled after every failure in a row, plus jitter
+        qint64 chunkSize = 16 * 1024 * 1024; // rounded down to whole 256 KiB units
+        int maxAttempts = 8;                 // failures in a row without progress before giving up
+        int firstRetryDelayMs = 1000;        // doubled after every failure in a row, plus jitter
         int maxRetryDelayMs = 60000;
         int transferTimeoutMs = 60000; // a request that moves no byte for this long is dropped
         int maxSessionRestarts = 3;    // sessions the server forgot, per upload

@@ -76,6 +76,7 @@ struct FakeYouTubeServer::Shared {
     QString storageDir;
     Faults faults;
     int tokenLifetime = 3600;
+    bool storesUploads = true;
     QList<Category> categories = defaultCategories();
     QList<Upload> uploads;        // by session, in order of creation
     QHash<QString, int> sessions; // upload_id -> index in uploads
@@ -125,6 +126,7 @@ class FakeYouTubeServer::Worker : public QObject {
 
     void adopt(QTcpSocket* socket) {
         socket->setParent(this);
+        socket->setSocketOption(QAbstractSocket::LowDelayOption, 1);
         requests_.insert(socket, PendingRequest{});
         connect(socket, &QTcpSocket::readyRead, this, [this, socket] { readFrom(socket); });
         connect(socket, &QTcpSocket::disconnected, this, [this, socket] {
@@ -250,7 +252,11 @@ class FakeYouTubeServer::Worker : public QObject {
         return range;
     }
 
-    static void append(Upload& upload, const QByteArray& bytes) {
+    void append(Upload& upload, const QByteArray& bytes) {
+        if (!shared_->storesUploads) {
+            upload.receivedSize += bytes.size();
+            return;
+        }
         QFile file(upload.filePath);
         if (file.open(QIODevice::Append)) {
             file.write(bytes);
@@ -504,7 +510,8 @@ class FakeYouTubeServer::Worker : public QObject {
         ++shared_->counters.sessionsStarted;
         const QString id = randomToken(24);
         upload.filePath = QDir(shared_->storageDir).filePath(id + QStringLiteral(".bin"));
-        QFile(upload.filePath).open(QIODevice::WriteOnly);
+        if (shared_->storesUploads)
+            QFile(upload.filePath).open(QIODevice::WriteOnly);
         shared_->sessions.insert(id, int(shared_->uploads.size()));
         shared_->uploads << upload;
         const QByteArray location =
@@ -632,6 +639,11 @@ void FakeYouTubeServer::setFaults(const Faults& faults) {
 FakeYouTubeServer::Faults FakeYouTubeServer::faults() const {
     std::lock_guard lock(shared_->mutex);
     return shared_->faults;
+}
+
+void FakeYouTubeServer::setStoresUploads(bool stores) {
+    std::lock_guard lock(shared_->mutex);
+    shared_->storesUploads = stores;
 }
 
 void FakeYouTubeServer::setAccessTokenLifetime(int seconds) {

@@ -75,6 +75,9 @@ class FakeYouTubeServer {
 
     void setFaults(const Faults& faults);
     Faults faults() const;
+    // Whether arriving bytes are written to storage (true) or only counted
+    // (for measuring throughput without filling the disk).
+    void setStoresUploads(bool stores);
     // Seconds an access token lives (3600 unless changed).
     void setAccessTokenLifetime(int seconds);
     // Categories served for every region: (id, title, assignable).

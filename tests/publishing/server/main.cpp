@@ -23,10 +23,15 @@ int main(int argc, char** argv) {
     const QCommandLineOption token(QStringLiteral("access-token"),
                                    QStringLiteral("An access token to accept"),
                                    QStringLiteral("token"));
+    const QCommandLineOption refresh(QStringLiteral("refresh-token"),
+                                     QStringLiteral("A refresh token to accept"),
+                                     QStringLiteral("token"));
+    const QCommandLineOption discard(QStringLiteral("discard"),
+                                     QStringLiteral("Count uploaded bytes without storing them"));
     const QCommandLineOption delay(QStringLiteral("delay"),
                                    QStringLiteral("Milliseconds every answer waits"),
                                    QStringLiteral("ms"));
-    parser.addOptions({storage, token, delay});
+    parser.addOptions({storage, token, refresh, discard, delay});
     parser.process(app);
 
     QTemporaryDir temporary;
@@ -38,6 +43,9 @@ int main(int argc, char** argv) {
     }
     if (parser.isSet(token))
         server.addAccessToken(parser.value(token), 24 * 3600);
+    if (parser.isSet(refresh))
+        server.addRefreshToken(parser.value(refresh));
+    server.setStoresUploads(!parser.isSet(discard));
     if (parser.isSet(delay)) {
         auto faults = server.faults();
         faults.responseDelayMs = parser.value(delay).toInt();
