@@ -59,7 +59,7 @@ tamsel_add_tests(tamsel_publishing_unit_tests unit
   SOURCES
     publishing/AgentTest.cpp
     publishing/VideoMetadataTest.cpp
-  LIBS tamsel_publishing_test_support Qt6::Widgets
+  LIBS tamsel_publishing_test_support Qt6::Widgets Qt6::Test
   MAIN tamsel_ui_test_main)
 
 # The form under Xvfb, pre-filled and publishing under the progress overlay.

@@ -99,6 +99,11 @@ YouTubeUploadForm::YouTubeUploadForm() {
     statusPanel_->hide();
     table_->addBanner(statusPanel_);
 
+    // Return in the title publishes, as the bar's default button would.
+    connect(qobject_cast<QLineEdit*>(title_->editor()), &QLineEdit::returnPressed, this, [this] {
+        if (canPublish())
+            emit publishRequested();
+    });
     connect(picker_, &CategoryPicker::rowSelected, this, &YouTubeUploadForm::pickerSelected);
     connect(title_, &FormTextCell::valueChanged, this, &YouTubeUploadForm::refreshState);
     connect(description_, &FormTextCell::valueChanged, this, &YouTubeUploadForm::refreshState);

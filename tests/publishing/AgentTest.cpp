@@ -13,7 +13,9 @@
 #include "platform/ui/Window.h"
 
 #include <QFile>
+#include <QLineEdit>
 #include <QStringList>
+#include <QTest>
 #include <gtest/gtest.h>
 
 using namespace testing_support;
@@ -124,13 +126,19 @@ TEST_F(AgentTest, CancelIsReportedAndNothingIsSent) {
     EXPECT_TRUE(services_.client->uploads.isEmpty());
 }
 
-TEST_F(AgentTest, PublishNeedsATitle) {
+TEST_F(AgentTest, PublishNeedsATitleAndReturnInTheTitlePublishes) {
     services_.signIn->signedIn = true;
     show();
+    auto* field = qobject_cast<QLineEdit*>(form()->titleCell()->editor());
     form()->titleCell()->setValue(QStringLiteral("  \n "));
     EXPECT_FALSE(form()->publishItem()->isEnabled());
     publish();
+    QTest::keyClick(field, Qt::Key_Return);
     EXPECT_EQ(delegate_->calls, QStringList{"willBeDisplayed"});
+    form()->titleCell()->setValue(QStringLiteral("Run"));
+    EXPECT_TRUE(form()->publishItem()->isEnabled());
+    QTest::keyClick(field, Qt::Key_Return);
+    EXPECT_EQ(delegate_->calls, (QStringList{"willBeDisplayed", "done", "didBegin"}));
 }
 
 TEST_F(AgentTest, WithoutAnAccountPublishSignsInFirstAndAFailedSignInEndsPublishing) {
