@@ -23,9 +23,9 @@ tamsel_add_tests(tamsel_share_sheet_tests unit
   LIBS tamsel_share_test_support Qt6::Test
   MAIN tamsel_ui_test_main)
 
-tamsel_add_tests(tamsel_editor_share_tests integration
-  SOURCES share/EditorShareTest.cpp editor/EditorFixture.cpp
-  LIBS tamsel_share_test_support tamsel_editor tamsel_media_generator
+tamsel_add_tests(tamsel_editor_share_tests unit
+  SOURCES share/EditorShareTest.cpp unit/editor/EditorOnFakes.cpp
+  LIBS tamsel_share_test_support tamsel_editor tamsel_test_fakes
   MAIN tamsel_ui_test_main)
 
 tamsel_add_tests(tamsel_share_end_to_end_tests integration

@@ -3,11 +3,11 @@
 // their order, its presentation, and what its completion records.
 
 #include "ShareFakes.h"
-#include "editor/EditorFixture.h"
 #include "platform/services/ActivityTypes.h"
 #include "platform/ui/Device.h"
 #include "platform/ui/Window.h"
 #include "support/Wait.h"
+#include "unit/editor/EditorOnFakes.h"
 #include "youtube/TXYouTubeActivity.h"
 
 using namespace platform;
@@ -15,10 +15,10 @@ using testing_support::waitUntil;
 
 namespace {
 
-class EditorShareTest : public EditorTest {
+class EditorShareTest : public EditorOnFakes {
   protected:
     void SetUp() override {
-        EditorTest::SetUp();
+        EditorOnFakes::SetUp();
         store->response.results = {testing_support::storeItem(
             "Racer", "Example Games", "https://store.example/apps/org.example.Racer")};
     }
@@ -27,13 +27,13 @@ class EditorShareTest : public EditorTest {
             editor->dismissViewControllerAnimated_completion(false);
         waitUntil([] { return false; }, 20);
         window.reset();
-        EditorTest::TearDown();
+        EditorOnFakes::TearDown();
     }
 
     // Makes the editor, shows it in a window of `size`, and waits until it
     // is on screen.
     void show(QSize size = QSize(900, 600)) {
-        ASSERT_TRUE(makeEditor());
+        makeEditor();
         window = std::make_unique<Window>();
         window->resize(size);
         window->setRootViewController(editor);
@@ -78,10 +78,10 @@ TEST_F(EditorShareTest, SharesTheStoreTextTheLinkAndTheRecording) {
     testing_support::LogCapture log;
     const auto sheet = share();
     ASSERT_TRUE(sheet);
-    EXPECT_EQ(sheet->activityItems(),
-              (QVariantList{QStringLiteral("Check out my recording of Racer by Example Games!"),
-                            QStringLiteral("https://store.example/apps/org.example.Racer"),
-                            QUrl::fromLocalFile(landscape())}));
+    EXPECT_EQ(
+        sheet->activityItems(),
+        (QVariantList{QStringLiteral("Check out my recording of Racer by Example Games!"),
+                      QStringLiteral("https://store.example/apps/org.example.Racer"), recording}));
     EXPECT_EQ(log.count("displayShareSheetWithVideoURL"), 1);
     EXPECT_EQ(store->requests().size(), 1);
     EXPECT_EQ(sheet->excludedActivityTypes(), QStringList{CopyToPasteboardActivityType});
@@ -96,12 +96,12 @@ TEST_F(EditorShareTest, SharesTheStoreTextTheLinkAndTheRecording) {
 TEST_F(EditorShareTest, AnOverrideMessageIsTheOnlyTextAndTheAttachmentComesLast) {
     show();
     editor->overrideShareMessage = "Look at this";
-    editor->fileAttachmentURL = QUrl::fromLocalFile(portrait());
+    editor->fileAttachmentURL = QUrl::fromLocalFile(QStringLiteral("/recordings/notes.txt"));
     const auto sheet = share();
     ASSERT_TRUE(sheet);
     EXPECT_EQ(sheet->activityItems(),
-              (QVariantList{QStringLiteral("Look at this"), QUrl::fromLocalFile(landscape()),
-                            QUrl::fromLocalFile(portrait())}));
+              (QVariantList{QStringLiteral("Look at this"), recording,
+                            QUrl::fromLocalFile(QStringLiteral("/recordings/notes.txt"))}));
     EXPECT_EQ(store->requests().size(), 1) << "the details are fetched all the same";
 
     sheet->finish(QString(), false);
@@ -118,8 +118,7 @@ TEST_F(EditorShareTest, WithoutAnAuthorTheTextIsTheNameAloneAndWithoutALinkNoLin
     show();
     auto sheet = share();
     ASSERT_TRUE(sheet);
-    EXPECT_EQ(sheet->activityItems(),
-              (QVariantList{QStringLiteral("Notes"), QUrl::fromLocalFile(landscape())}));
+    EXPECT_EQ(sheet->activityItems(), (QVariantList{QStringLiteral("Notes"), recording}));
 
     sheet->finish(QString(), false);
     store->response.results = {};
@@ -161,11 +160,13 @@ TEST_F(EditorShareTest, YouTubeIsOfferedOnlyWithoutItsOwnExtensionAndWithSupport
 TEST_F(EditorShareTest, AfterATrimmedSaveTheRecordingAsReceivedIsShared) {
     show();
     // What the trimmed save's completion does: the player moves to the clip.
-    editor->reloadAVLayerWithURL(QUrl::fromLocalFile(portrait()));
-    ASSERT_EQ(editor->videoURL, QUrl::fromLocalFile(portrait()));
+    const QUrl clip = QUrl::fromLocalFile(QStringLiteral("/clips/Racer_T.mp4"));
+    fakes.world().addMovie(clip, fakes::FakeMovie{});
+    editor->reloadAVLayerWithURL(clip);
+    ASSERT_EQ(editor->videoURL, clip);
     const auto sheet = share();
     ASSERT_TRUE(sheet);
-    EXPECT_EQ(sheet->activityItems().last(), QUrl::fromLocalFile(landscape()));
+    EXPECT_EQ(sheet->activityItems().last(), recording);
 }
 
 TEST_F(EditorShareTest, CompletedActivitiesAreRecordedEachTimeAndOthersNot) {

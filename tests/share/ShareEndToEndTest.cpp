@@ -124,9 +124,9 @@ tap doneButton
     ASSERT_EQ(cancelled.dumps.size(), 2);
     const QJsonObject sheet = cancelled.dumps[0]["shareSheet"].toObject();
     EXPECT_EQ(names(sheet["activityTypes"]),
-              (QStringList{"org.tamsel.activity.Mail", "org.tamsel.activity.SaveToFiles",
-                           "org.tamsel.activity.ShowInFolder"}))
-        << "no phone, no web link for Facebook, copy excluded";
+              (QStringList{"org.tamsel.activity.Mail", "TXPublishToYouTube",
+                           "org.tamsel.activity.SaveToFiles", "org.tamsel.activity.ShowInFolder"}))
+        << "no phone, no web link for Facebook, copy excluded, the plug-in built beside";
     EXPECT_EQ(names(sheet["items"]),
               (QStringList{"Check out my recording of Racer by Example Games!",
                            "appstream://org.example.Racer", recording()}));
