@@ -11,3 +11,8 @@ tamsel_add_tests(tamsel_editor_tests integration
 tamsel_add_tests(tamsel_automation_tests unit
   SOURCES editor/AutomationScriptTest.cpp
   LIBS tamsel_extension_app)
+
+tamsel_add_tests(tamsel_editor_keyboard_tests integration
+  SOURCES editor/EditorFixture.cpp editor/EditorKeyboardTest.cpp
+  LIBS tamsel_extension_app tamsel_media_generator
+  MAIN tamsel_ui_test_main)

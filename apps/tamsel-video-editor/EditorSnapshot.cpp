@@ -52,6 +52,22 @@ QString nameOfItem(TXVideoEditorViewController& editor, const ToolbarItem* item)
     return QString();
 }
 
+QString focusedControl(TXVideoEditorViewController& editor) {
+    const QWidget* focus = editor.isViewLoaded() ? editor.view()->window()->focusWidget() : nullptr;
+    if (!focus)
+        return QString();
+    if (focus == editor.avTrimmer.get())
+        return QStringLiteral("avTrimmer");
+    for (const QWidget* overlay = focus; overlay; overlay = overlay->parentWidget())
+        if (overlay == editor.videoOverlayPlayButtonView.get())
+            return QStringLiteral("videoOverlayPlayButton");
+    for (platform::Toolbar* bar : {editor.topToolBar.get(), editor.bottomToolBar.get()})
+        for (const auto& item : bar ? bar->items() : platform::Toolbar::ItemList())
+            if (bar->widgetForItem(item.get()) == focus)
+                return nameOfItem(editor, item.get());
+    return QString::fromLatin1(focus->metaObject()->className());
+}
+
 QJsonObject dump(TXVideoEditorViewController& editor) {
     const bool bottomInView = editor.bottomToolBar && editor.bottomToolBar->superview();
     return QJsonObject{
@@ -71,6 +87,7 @@ QJsonObject dump(TXVideoEditorViewController& editor) {
         {QStringLiteral("bottomToolBar"),
          bottomInView ? itemNames(editor, editor.bottomToolBar.get()) : QJsonArray()},
         {QStringLiteral("activityTypes"), QJsonArray::fromStringList(editor.activityTypes)},
+        {QStringLiteral("focus"), focusedControl(editor)},
     };
 }
 

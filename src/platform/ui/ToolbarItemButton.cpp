@@ -3,13 +3,14 @@
 #include "platform/ui/ToolbarItem.h"
 
 #include <QFontMetrics>
+#include <QKeyEvent>
 #include <QPainter>
 
 namespace platform {
 
 ToolbarItemButton::ToolbarItemButton(std::shared_ptr<ToolbarItem> item, QWidget* parent)
     : QAbstractButton(parent), item_(std::move(item)) {
-    setFocusPolicy(Qt::StrongFocus);
+    setFocusPolicy(Qt::TabFocus);
     setCursor(Qt::PointingHandCursor);
     connect(this, &QAbstractButton::clicked, this, [this] { item_->trigger(); });
     connect(item_.get(), &ToolbarItem::changed, this, [this] { refresh(); });
@@ -18,7 +19,14 @@ ToolbarItemButton::ToolbarItemButton(std::shared_ptr<ToolbarItem> item, QWidget*
 
 void ToolbarItemButton::refresh() {
     setAccessibleName(item_->title());
-    setToolTip(item_->showsIcon() ? item_->title() : QString());
+    const QString key = item_->shortcut().toString(QKeySequence::NativeText);
+    if (key.isEmpty()) {
+        setToolTip(item_->showsIcon() ? item_->title() : QString());
+        setAccessibleDescription(QString());
+    } else {
+        setToolTip(tr("%1 (%2)").arg(item_->title(), key));
+        setAccessibleDescription(tr("Shortcut: %1").arg(key));
+    }
     setEnabled(item_->isEnabled());
     QFont f = font();
     f.setBold(item_->isProminent());
@@ -80,6 +88,21 @@ void ToolbarItemButton::paintEvent(QPaintEvent*) {
         painter.setPen(QPen(ring, 2));
         painter.setBrush(Qt::NoBrush);
         painter.drawRoundedRect(area.adjusted(2, 6, -2, -6), 6, 6);
+    }
+}
+
+void ToolbarItemButton::keyPressEvent(QKeyEvent* event) {
+    switch (event->key()) {
+    case Qt::Key_Left:
+    case Qt::Key_Right:
+    case Qt::Key_Up:
+    case Qt::Key_Down:
+        // A plain button would move the focus; in a bar over a movie the
+        // arrows step through the movie instead.
+        event->ignore();
+        return;
+    default:
+        QAbstractButton::keyPressEvent(event);
     }
 }
 
