@@ -1,5 +1,5 @@
 tamsel_add_tests(tamsel_end_to_end_tests integration
-  SOURCES editor/EndToEndFixture.cpp editor/EndToEndTest.cpp
+  SOURCES editor/EndToEndFixture.cpp editor/EndToEndTest.cpp editor/DrawingTest.cpp
   LIBS tamsel_platform_media tamsel_media_generator)
 add_dependencies(tamsel_end_to_end_tests tamsel-edit tamsel-video-editor)
 

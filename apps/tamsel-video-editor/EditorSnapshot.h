@@ -19,9 +19,14 @@ QString nameOfItem(TXVideoEditorViewController& editor, const platform::ToolbarI
 // name, "avTrimmer", "videoOverlayPlayButton", another widget's class name,
 // or "" when nothing has it.
 QString focusedControl(TXVideoEditorViewController& editor);
+// Where the shown controls are in the window, in device-independent pixels:
+// name ("topToolBar", "bottomToolBar", "avTrimmer", "videoOverlayPlayButton",
+// or an item's name) to [x, y, width, height].
+QJsonObject frames(TXVideoEditorViewController& editor);
 // introMode, trimming, exporting, scrubbing, hasEdit, padMode, uiHidden,
 // editStartTime, editEndTime, currentTime, videoURL, topToolBar,
-// bottomToolBar (empty when it is not in the view), activityTypes, focus.
+// bottomToolBar (empty when it is not in the view), activityTypes, focus,
+// frames.
 QJsonObject dump(TXVideoEditorViewController& editor);
 
 } // namespace EditorSnapshot

@@ -69,13 +69,15 @@ void ToolbarItemButton::paintEvent(QPaintEvent*) {
         QRectF iconRect(0, 0, IconSide, IconSide);
         iconRect.moveCenter(slot.center());
         const qreal ratio = devicePixelRatioF();
-        QPixmap glyph = item_->icon().pixmap(QSize(IconSide, IconSide), ratio);
-        // Icons are templates: their shape, painted in the tint.
+        const QPixmap glyph = item_->icon().pixmap(QSize(IconSide, IconSide), ratio);
+        // Icons are templates: their shape, painted in the tint. The mask is
+        // laid pixel for pixel: drawn by its logical size, a glyph of a
+        // denser screen would cover only part of the tint.
         QImage tinted(glyph.size(), QImage::Format_ARGB32_Premultiplied);
         tinted.fill(tint);
         QPainter mask(&tinted);
         mask.setCompositionMode(QPainter::CompositionMode_DestinationIn);
-        mask.drawPixmap(0, 0, glyph);
+        mask.drawPixmap(QRect(QPoint(0, 0), glyph.size()), glyph);
         mask.end();
         tinted.setDevicePixelRatio(glyph.devicePixelRatio());
         painter.drawImage(iconRect, tinted);

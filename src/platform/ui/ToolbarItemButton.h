@@ -9,7 +9,7 @@ class ToolbarItem;
 
 // The widget a toolbar makes for a titled, image or system item: the item's
 // icon tinted with the bar's colour (moved by the item's image insets) or its
-// title. Reached with Tab (a click does
+// title, drawn at the screen's pixel density. Reached with Tab (a click does
 // not take the focus from where the user's keys go) and activated by space or
 // return; other keys, arrows included, go on to the window's shortcuts. Its
 // accessible name is the item's title; the item's shortcut, when it has one,
