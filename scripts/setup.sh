@@ -11,7 +11,7 @@ packages=(
   libgtest-dev libgmock-dev libbenchmark-dev
   xvfb xauth ffmpeg
   libgl1-mesa-dri libegl1 fonts-dejavu-core adwaita-icon-theme
-  desktop-file-utils appstream
+  dpkg-dev desktop-file-utils appstream
 )
 
 missing=()
