@@ -2,6 +2,8 @@
 
 #include "platform/ui/Button.h"
 
+#include <QApplication>
+
 #include <cmath>
 
 using namespace platform;
@@ -61,6 +63,23 @@ EditorKeyboard::EditorKeyboard(QWidget* window, EditorLookup editor)
         QKeySequence(Qt::SHIFT | Qt::Key_Right), [this] { return stepPlayhead(1, true); }, repeats);
     map_->bind(QKeySequence(Qt::Key_Home), [this] { return playheadToRangeEnd(false); });
     map_->bind(QKeySequence(Qt::Key_End), [this] { return playheadToRangeEnd(true); });
+    // The focused control has the first word on a key, before the map; the
+    // chrome it sits in must be seen first.
+    qApp->installEventFilter(this);
+}
+
+bool EditorKeyboard::eventFilter(QObject* watched, QEvent* event) {
+    if (event->type() != QEvent::KeyPress || watched != window_->focusWidget())
+        return false;
+    TXVideoEditorViewController* editor = reachableEditor();
+    if (!editor || !editor->isUIHidden())
+        return false;
+    for (QWidget* chrome : {static_cast<QWidget*>(editor->topToolBar.get()),
+                            static_cast<QWidget*>(editor->bottomToolBar.get()),
+                            static_cast<QWidget*>(editor->scrubberContainterView.get())})
+        if (chrome && chrome->isAncestorOf(static_cast<QWidget*>(watched)))
+            revealChrome(*editor);
+    return false;
 }
 
 TXVideoEditorViewController* EditorKeyboard::reachableEditor() const {

@@ -17,9 +17,10 @@
 //
 // Every key does what pressing the control does or what the scrubber reports
 // for a drag, so the editor cannot tell a key from a hand. A key whose
-// control has faded out with the chrome first brings the chrome back, as the
-// hand's tap on the video must. Keys do nothing while a sheet or alert is
-// presented over the editor.
+// control has faded out with the chrome (a shortcut's, or the focused
+// control's own) first brings the chrome back, as the hand's tap on the
+// video must. Keys do nothing while a sheet or alert is presented over the
+// editor.
 //
 // Main thread only. Lives as long as the window (a Qt child of its map); the
 // editor is looked up at each key, as it comes and goes with the request.
@@ -39,6 +40,10 @@ class EditorKeyboard : public QObject {
     void editorDidAppear();
 
     platform::ShortcutMap& map() { return *map_; }
+
+  protected:
+    // Sees each key on its way to the focused control.
+    bool eventFilter(QObject* watched, QEvent* event) override;
 
   private:
     // The editor when keys may reach it, else null.

@@ -84,6 +84,33 @@ TEST_F(EditorKeyboardTest, SpacePlaysFromTheOverlayThenPausesWithTheChromeBack) 
     EXPECT_TRUE(editor->isUIHidden());
 }
 
+TEST_F(EditorKeyboardTest, AFocusedButtonKeepsTheKeysAndTheFocusFollowsPlayAndPause) {
+    ASSERT_TRUE(show());
+    type(Qt::Key_Space);
+    ASSERT_TRUE(waitUntil([&] { return playing(); }));
+    type(Qt::Key_Space);
+    ASSERT_TRUE(topBarHolds(editor->playButton));
+    QWidget* play = editor->topToolBar->widgetForItem(editor->playButton.get());
+    play->setFocus(Qt::TabFocusReason);
+
+    type(Qt::Key_Space);
+    EXPECT_TRUE(waitUntil([&] { return playing(); }));
+    EXPECT_EQ(window->focusWidget(), editor->topToolBar->widgetForItem(editor->pauseButton.get()))
+        << "play became pause where it stood";
+    ASSERT_TRUE(editor->isUIHidden());
+    // The focused pause button has faded out with the chrome: its key shows
+    // the chrome again and presses it.
+    type(Qt::Key_Space);
+    EXPECT_FALSE(playing());
+    EXPECT_FALSE(editor->isUIHidden());
+    EXPECT_EQ(window->focusWidget(), editor->topToolBar->widgetForItem(editor->playButton.get()));
+
+    // A focused toolbar button leaves the arrows to the movie.
+    const double before = playhead();
+    type(Qt::Key_Right);
+    EXPECT_NEAR(playhead(), before + 1.0 / 30.0, 0.02);
+}
+
 TEST_F(EditorKeyboardTest, ArrowsStepFramesAndSecondsAndIAndOTrimAtThePlayhead) {
     ASSERT_TRUE(show());
     const double frame = 1.0 / 30.0;

@@ -136,3 +136,23 @@ TEST(UiToolbar, ItemsTakeTheBarsTintUnlessTheyHaveTheirOwn) {
     EXPECT_EQ(qobject_cast<ToolbarItemButton*>(b.bar->widgetForItem(save.get()))->effectiveTint(),
               QColor(10, 120, 30));
 }
+
+TEST(UiToolbar, ReplacingTheListKeepsTheKeyboardWhereItWas) {
+    Bar b;
+    auto play = ToolbarItem::systemItem(Item::Play);
+    auto pause = ToolbarItem::systemItem(Item::Pause);
+    auto share = ToolbarItem::systemItem(Item::Action);
+    auto title = ToolbarItem::customViewItem(new Label(QRectF(0, 0, 120, 17)));
+    b.bar->setItems({play, share});
+    b.bar->widgetForItem(play.get())->setFocus();
+
+    b.bar->setItems({pause, share}); // what a press on play does
+    EXPECT_EQ(b.root.focusWidget(), b.bar->widgetForItem(pause.get())) << "the same place";
+    b.bar->setItems({share, pause});
+    EXPECT_EQ(b.root.focusWidget(), b.bar->widgetForItem(pause.get())) << "the same item";
+    b.bar->setItems({share, title});
+    EXPECT_EQ(b.root.focusWidget(), nullptr) << "a title takes no focus; nor does the next item";
+
+    b.bar->setItems({play, share}); // nothing had the focus: nothing takes it
+    EXPECT_EQ(b.root.focusWidget(), nullptr);
+}
