@@ -9,7 +9,6 @@
 
 #include <QApplication>
 #include <QKeyEvent>
-#include <QSet>
 
 using namespace platform;
 using testing_support::waitUntil;
@@ -183,34 +182,23 @@ TEST_F(EditorKeyboardTest, KeysWaitWhileASheetCoversTheEditor) {
     EXPECT_TRUE(editor->isTrimming());
 }
 
-TEST_F(EditorKeyboardTest, TabReachesEveryControlAndEachNamesItsKey) {
+TEST_F(EditorKeyboardTest, EachControlNamesItsKey) {
     ASSERT_TRUE(show());
     type(Qt::Key_I); // edit mode: the bar with the most keyed items
-    QSet<QWidget*> reached;
-    for (int i = 0; i < 30; ++i) {
-        type(Qt::Key_Tab);
-        reached.insert(window->focusWidget());
-    }
-    for (const auto& item : editor->topToolBar->items()) {
-        QWidget* button = editor->topToolBar->widgetForItem(item.get());
-        if (button && item != editor->titleButton) {
-            EXPECT_TRUE(reached.contains(button)) << item->title().toStdString();
-        }
-    }
-    EXPECT_TRUE(reached.contains(editor->avTrimmer.get()));
-
-    const auto tip = [&](const std::shared_ptr<ToolbarItem>& item) {
-        return editor->topToolBar->widgetForItem(item.get())->toolTip();
+    const auto button = [&](const std::shared_ptr<ToolbarItem>& item) {
+        return editor->topToolBar->widgetForItem(item.get());
     };
     const QString ctrlS = QKeySequence(QKeySequence::Save).toString(QKeySequence::NativeText);
-    EXPECT_TRUE(tip(editor->playButton).endsWith("(Space)"))
-        << tip(editor->playButton).toStdString();
-    EXPECT_TRUE(tip(editor->trimButton).endsWith("(" + ctrlS + ")"));
-    EXPECT_TRUE(tip(editor->cancelTrimButton).endsWith("(Esc)"));
+    EXPECT_EQ(button(editor->playButton)->toolTip(), editor->playButton->title() + " (Space)");
+    EXPECT_EQ(button(editor->playButton)->accessibleDescription(), "Shortcut: Space");
+    EXPECT_EQ(button(editor->trimButton)->toolTip(),
+              editor->trimButton->title() + " (" + ctrlS + ")");
+    EXPECT_EQ(button(editor->cancelTrimButton)->accessibleDescription(), "Shortcut: Esc");
     EXPECT_EQ(editor->saveButton->shortcut(), QKeySequence(QKeySequence::Save));
     EXPECT_EQ(editor->pauseButton->shortcut(), QKeySequence(Qt::Key_Space));
+    EXPECT_TRUE(button(editor->titleButton)->toolTip().isEmpty());
     const QString scrubberKeys = editor->avTrimmer->accessibleDescription();
     EXPECT_TRUE(scrubberKeys.contains(" I ") && scrubberKeys.contains(" O "))
         << scrubberKeys.toStdString();
-    EXPECT_TRUE(editor->videoOverlayPlayButtonView->toolTip().contains("Space"));
+    EXPECT_EQ(editor->videoOverlayPlayButtonView->toolTip(), "Play (Space)");
 }

@@ -101,20 +101,3 @@ TEST(UiShortcutMap, AToolbarItemIsPressedOnlyWhereABarShowsItAndWhenEnabled) {
     EXPECT_FALSE(ShortcutMap::pressToolbarItem(&w.root, save.get()));
     EXPECT_EQ(saves, 1);
 }
-
-TEST(UiShortcutMap, AnItemNamesItsShortcutInTheTooltipAndTheAccessibleDescription) {
-    Window w;
-    auto save = ToolbarItem::systemItem(Item::Save);
-    auto play = ToolbarItem::systemItem(Item::Play);
-    w.bar->setItems({save, play});
-    QWidget* saveButton = w.bar->widgetForItem(save.get());
-    EXPECT_TRUE(saveButton->toolTip().isEmpty()) << "a titled item needs no tooltip";
-    EXPECT_TRUE(saveButton->accessibleDescription().isEmpty());
-
-    save->setShortcut(QKeySequence(Qt::CTRL | Qt::Key_S));
-    play->setShortcut(QKeySequence(Qt::Key_Space));
-    const QString ctrlS = QKeySequence(Qt::CTRL | Qt::Key_S).toString(QKeySequence::NativeText);
-    EXPECT_EQ(saveButton->toolTip(), save->title() + " (" + ctrlS + ")");
-    EXPECT_EQ(saveButton->accessibleDescription(), "Shortcut: " + ctrlS);
-    EXPECT_EQ(w.bar->widgetForItem(play.get())->toolTip(), play->title() + " (Space)");
-}
