@@ -12,7 +12,8 @@ packages=(
   libgtest-dev libgmock-dev libbenchmark-dev
   xvfb xauth ffmpeg dbus-daemon
   libgl1-mesa-dri libegl1 fonts-dejavu-core adwaita-icon-theme
-  qt6-networkauth-dev qtkeychain-qt6-dev libsecret-1-0 dbus-daemon gnome-keyring curl hyperfine
+  qt6-networkauth-dev qtkeychain-qt6-dev libsecret-1-0 gnome-keyring curl hyperfine
+  dpkg-dev desktop-file-utils appstream
 )
 
 missing=()

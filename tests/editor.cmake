@@ -1,5 +1,5 @@
 tamsel_add_tests(tamsel_end_to_end_tests integration
-  SOURCES editor/EndToEndFixture.cpp editor/EndToEndTest.cpp
+  SOURCES editor/EndToEndFixture.cpp editor/EndToEndTest.cpp editor/DrawingTest.cpp
   LIBS tamsel_platform_media tamsel_media_generator)
 add_dependencies(tamsel_end_to_end_tests tamsel-edit tamsel-video-editor)
 
@@ -23,4 +23,9 @@ tamsel_add_tests(tamsel_editor_unit_tests unit
     unit/editor/EditorExportTest.cpp
     unit/editor/EditorLayoutTest.cpp
   LIBS tamsel_editor tamsel_test_fakes
+  MAIN tamsel_ui_test_main)
+
+tamsel_add_tests(tamsel_editor_keyboard_tests unit
+  SOURCES unit/editor/EditorOnFakes.cpp editor/EditorKeyboardTest.cpp
+  LIBS tamsel_extension_app tamsel_test_fakes
   MAIN tamsel_ui_test_main)

@@ -12,6 +12,7 @@
 #include <QKeyEvent>
 #include <QListWidget>
 #include <QMouseEvent>
+#include <QPointer>
 #include <QTimer>
 #include <cstdio>
 
@@ -98,6 +99,9 @@ void AutomationDriver::runNext() {
     case AutomationCommand::Kind::Drag:
         failure = drag(c.target, c.value);
         break;
+    case AutomationCommand::Kind::Key:
+        key(QKeySequence::fromString(c.text, QKeySequence::PortableText));
+        break;
     case AutomationCommand::Kind::Shake:
         entry_.window().shake();
         break;
@@ -111,6 +115,18 @@ void AutomationDriver::runNext() {
         std::fflush(stdout);
         break;
     case AutomationCommand::Kind::Screenshot:
+        if (qEnvironmentVariableIsSet("DBG_TREE")) {
+            QWidget& w = entry_.window();
+            for (QWidget* c : w.findChildren<QWidget*>())
+                if (c->isVisible()) {
+                    QRect g(c->mapTo(&w, QPoint(0, 0)), c->size());
+                    std::fprintf(stderr, "DBG %s %s parent=%s %d,%d %dx%d auto=%d\n",
+                                 c->metaObject()->className(), qPrintable(c->objectName()),
+                                 c->parentWidget() ? c->parentWidget()->metaObject()->className()
+                                                   : "",
+                                 g.x(), g.y(), g.width(), g.height(), c->autoFillBackground());
+                }
+        }
         if (!entry_.window().grab().save(c.text, "PNG"))
             failure = QStringLiteral("cannot write %1").arg(c.text);
         break;
@@ -257,6 +273,31 @@ void AutomationDriver::pollRetry() {
         return;
     }
     QTimer::singleShot(20, this, &AutomationDriver::pollRetry);
+}
+
+void AutomationDriver::key(const QKeySequence& sequence) {
+    // Keys go where the user's keys go: to the focused control, and from
+    // there up to the window when the control does not take them.
+    QWidget* window = &entry_.window();
+    QWidget* target = window->focusWidget() ? window->focusWidget() : window;
+    const QKeyCombination combination = sequence[0];
+    const Qt::Key k = combination.key();
+    QString text;
+    if (!(combination.keyboardModifiers() & (Qt::ControlModifier | Qt::AltModifier))) {
+        if (k == Qt::Key_Space)
+            text = QStringLiteral(" ");
+        else if (k >= Qt::Key_A && k <= Qt::Key_Z)
+            text =
+                QChar(combination.keyboardModifiers() & Qt::ShiftModifier ? 'A' + (k - Qt::Key_A)
+                                                                          : 'a' + (k - Qt::Key_A));
+    }
+    QPointer<QWidget> guard(target);
+    QKeyEvent press(QEvent::KeyPress, k, combination.keyboardModifiers(), text);
+    QApplication::sendEvent(target, &press);
+    if (!guard)
+        target = window;
+    QKeyEvent release(QEvent::KeyRelease, k, combination.keyboardModifiers(), text);
+    QApplication::sendEvent(target, &release);
 }
 
 bool AutomationDriver::holds(const AutomationCommand& c) {

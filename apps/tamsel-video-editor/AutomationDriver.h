@@ -4,6 +4,7 @@
 #include "ExtensionEntry.h"
 
 #include <QDeadlineTimer>
+#include <QKeySequence>
 #include <QObject>
 #include <QStringList>
 #include <functional>
@@ -12,7 +13,8 @@
 // Runs an automation script against the editor of an extension request, one
 // command after another, through the paths a user's input takes: synthetic
 // mouse presses on the toolbar buttons and the overlay, mouse drags on the
-// scrubber, the window's shake entry, window resizes. Main thread only.
+// scrubber, key presses to the focused control (or the window), the window's
+// shake entry, window resizes. Main thread only.
 //
 // When the script has run, the request ends (as if the host dismissed the
 // editor). A command that fails prints why on stderr and ends the request;
@@ -38,6 +40,7 @@ class AutomationDriver : public QObject {
     // Picks an activity in the open share sheet, or cancels the sheet, as
     // the user would: a click on its row, the Escape key.
     QString share(const QString& typeOrTitle);
+    void key(const QKeySequence& key);
     // Polls the condition until it holds or the timeout passes.
     void wait(const AutomationCommand& command);
     void pollWait();

@@ -1,5 +1,6 @@
 #include "AutomationScript.h"
 
+#include <QKeySequence>
 #include <QRegularExpression>
 #include <cmath>
 
@@ -93,6 +94,14 @@ std::optional<QList<AutomationCommand>> parseAutomationScript(const QString& tex
                 return fail(QStringLiteral("screenshot takes a file name"));
             c.kind = AutomationCommand::Kind::Screenshot;
             c.text = w[1];
+        } else if (verb == QLatin1String("key")) {
+            const QKeySequence key =
+                w.size() == 2 ? QKeySequence::fromString(w[1], QKeySequence::PortableText)
+                              : QKeySequence();
+            if (key.count() != 1 || key[0].key() == Qt::Key_unknown)
+                return fail(QStringLiteral("key takes one key, such as Space, I or Ctrl+S"));
+            c.kind = AutomationCommand::Kind::Key;
+            c.text = key.toString(QKeySequence::PortableText);
         } else if (verb == QLatin1String("resize")) {
             std::optional<double> width, height;
             if (w.size() != 3 || !(width = number(w[1], true)) || !(height = number(w[2], true)))

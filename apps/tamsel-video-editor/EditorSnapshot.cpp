@@ -70,6 +70,43 @@ QString nameOfItem(TXVideoEditorViewController& editor, const ToolbarItem* item)
     return QString();
 }
 
+QString focusedControl(TXVideoEditorViewController& editor) {
+    const QWidget* focus = editor.isViewLoaded() ? editor.view()->window()->focusWidget() : nullptr;
+    if (!focus)
+        return QString();
+    if (focus == editor.avTrimmer.get())
+        return QStringLiteral("avTrimmer");
+    for (const QWidget* overlay = focus; overlay; overlay = overlay->parentWidget())
+        if (overlay == editor.videoOverlayPlayButtonView.get())
+            return QStringLiteral("videoOverlayPlayButton");
+    for (platform::Toolbar* bar : {editor.topToolBar.get(), editor.bottomToolBar.get()})
+        for (const auto& item : bar ? bar->items() : platform::Toolbar::ItemList())
+            if (bar->widgetForItem(item.get()) == focus)
+                return nameOfItem(editor, item.get());
+    return QString::fromLatin1(focus->metaObject()->className());
+}
+
+QJsonObject frames(TXVideoEditorViewController& editor) {
+    QJsonObject out;
+    if (!editor.isViewLoaded())
+        return out;
+    const QWidget* window = editor.view()->window();
+    auto add = [&](const QString& name, const QWidget* w) {
+        if (!w || !w->isVisibleTo(window) || !window->isAncestorOf(w))
+            return;
+        const QPoint at = w->mapTo(window, QPoint(0, 0));
+        out.insert(name, QJsonArray{at.x(), at.y(), w->width(), w->height()});
+    };
+    add(QStringLiteral("topToolBar"), editor.topToolBar.get());
+    add(QStringLiteral("bottomToolBar"), editor.bottomToolBar.get());
+    add(QStringLiteral("avTrimmer"), editor.avTrimmer.get());
+    add(QStringLiteral("videoOverlayPlayButton"), editor.videoOverlayPlayButtonView.get());
+    for (platform::Toolbar* bar : {editor.topToolBar.get(), editor.bottomToolBar.get()})
+        for (const auto& item : bar ? bar->items() : platform::Toolbar::ItemList())
+            add(nameOfItem(editor, item.get()), bar->widgetForItem(item.get()));
+    return out;
+}
+
 QJsonObject dump(TXVideoEditorViewController& editor) {
     const bool bottomInView = editor.bottomToolBar && editor.bottomToolBar->superview();
     return QJsonObject{
@@ -90,6 +127,8 @@ QJsonObject dump(TXVideoEditorViewController& editor) {
          bottomInView ? itemNames(editor, editor.bottomToolBar.get()) : QJsonArray()},
         {QStringLiteral("activityTypes"), QJsonArray::fromStringList(editor.activityTypes)},
         {QStringLiteral("shareSheet"), shareSheet(editor)},
+        {QStringLiteral("focus"), focusedControl(editor)},
+        {QStringLiteral("frames"), frames(editor)},
     };
 }
 

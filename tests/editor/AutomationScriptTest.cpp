@@ -60,3 +60,18 @@ TEST(AutomationScript, ShareNamesAnActivityByTypeOrQuotedTitleOrCancels) {
     EXPECT_FALSE(parseAutomationScript("share\n", &error));
     EXPECT_FALSE(parseAutomationScript("share Mail now\n", &error));
 }
+
+TEST(AutomationScript, KeysAreOneKeyWithItsModifiers) {
+    QString error;
+    const auto script = parseAutomationScript("key Space\nkey ctrl+s\nkey Shift+Right\n", &error);
+    ASSERT_TRUE(script) << error.toStdString();
+    ASSERT_EQ(script->size(), 3);
+    EXPECT_EQ((*script)[0].kind, Kind::Key);
+    EXPECT_EQ((*script)[0].text, "Space");
+    EXPECT_EQ((*script)[1].text, "Ctrl+S");
+    EXPECT_EQ((*script)[2].text, "Shift+Right");
+    for (const char* line : {"key", "key Ctrl+S Ctrl+Z", "key Ctrl+S,Ctrl+Z", "key Frobnicate"}) {
+        EXPECT_FALSE(parseAutomationScript(line, &error)) << line;
+        EXPECT_TRUE(error.startsWith("line 1: ")) << line;
+    }
+}
