@@ -10,6 +10,7 @@ tamsel_add_tests(tamsel_youtube_activity_tests unit
     youtube/YouTubeActivityTest.cpp
     youtube/YouTubeActivityPublishingTest.cpp
     youtube/YouTubeActivityPluginTest.cpp
+    youtube/PresentedSnapshotTest.cpp
     media/MediaFixtures.cpp
-  LIBS tamsel_youtube tamsel_media_generator Qt6::Test
+  LIBS tamsel_youtube tamsel_extension_app tamsel_media_generator Qt6::Test
   MAIN tamsel_ui_test_main)

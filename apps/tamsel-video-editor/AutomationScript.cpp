@@ -93,6 +93,11 @@ std::optional<QList<AutomationCommand>> parseAutomationScript(const QString& tex
                 return fail(QStringLiteral("screenshot takes a file name"));
             c.kind = AutomationCommand::Kind::Screenshot;
             c.text = w[1];
+        } else if (verb == QLatin1String("press")) {
+            if (w.size() != 2)
+                return fail(QStringLiteral("press takes the title of an alert's button"));
+            c.kind = AutomationCommand::Kind::Press;
+            c.text = w[1];
         } else if (verb == QLatin1String("resize")) {
             std::optional<double> width, height;
             if (w.size() != 3 || !(width = number(w[1], true)) || !(height = number(w[2], true)))
@@ -117,7 +122,8 @@ std::optional<QList<AutomationCommand>> parseAutomationScript(const QString& tex
                     return fail(QStringLiteral("wait log takes a text"));
                 c.text = w[2];
                 next = 3;
-            } else if (!QStringList{"ready", "frame", "playing", "paused", "exporting=false"}
+            } else if (!QStringList{"ready", "frame", "playing", "paused", "exporting=false",
+                                    "alert"}
                             .contains(c.target)) {
                 return fail(QStringLiteral("cannot wait for %1").arg(c.target));
             }

@@ -6,13 +6,26 @@
 
 // One command of an automation script.
 struct AutomationCommand {
-    enum class Kind { Tap, Drag, Shake, Resize, Sleep, Wait, Dump, Dismiss, Screenshot, Share };
+    enum class Kind {
+        Tap,
+        Drag,
+        Shake,
+        Resize,
+        Sleep,
+        Wait,
+        Dump,
+        Dismiss,
+        Screenshot,
+        Share,
+        Press,
+    };
     Kind kind = Kind::Dump;
     int line = 0;        // 1-based line in the script
     QString target;      // tap: item name; drag: playhead|start|end; wait:
-                         // ready|playing|paused|exporting=false|log; share:
-                         // an activity's type or title, or cancel
-    QString text;        // wait log: the text to look for; screenshot: the file
+                         // ready|playing|paused|exporting=false|log|alert;
+                         // share: an activity's type or title, or cancel
+    QString text;        // wait log: the text to look for; screenshot: the file;
+                         // press: the alert button's title
     double value = 0;    // drag: seconds; sleep: seconds; resize: width
     double value2 = 0;   // resize: height
     double timeout = 30; // wait, share: seconds

@@ -35,6 +35,18 @@ dismiss
     EXPECT_EQ((*script)[9].kind, Kind::Dismiss);
 }
 
+TEST(AutomationScript, PressesAnAlertsButtonByItsTitleAndWaitsForAnAlert) {
+    QString error;
+    const auto script = parseAutomationScript("wait alert 90\npress \"View on YouTube\"\n", &error);
+    ASSERT_TRUE(script) << error.toStdString();
+    ASSERT_EQ(script->size(), 2);
+    EXPECT_EQ((*script)[0].target, "alert");
+    EXPECT_DOUBLE_EQ((*script)[0].timeout, 90);
+    EXPECT_EQ((*script)[1].kind, Kind::Press);
+    EXPECT_EQ((*script)[1].text, "View on YouTube");
+    EXPECT_FALSE(parseAutomationScript("press View on YouTube", &error));
+}
+
 TEST(AutomationScript, RefusesAnythingElseNamingTheLine) {
     const char* bad[] = {"tap",           "tap a b",      "drag middle 3", "drag end -1",
                          "drag end soon", "wait forever", "wait log",      "wait ready 0",
