@@ -115,7 +115,10 @@ void AutomationDriver::runNext() {
         break;
     }
     case AutomationCommand::Kind::Press:
-        failure = PresentedSnapshot::pressAlertAction(editor(), c.text);
+        failure = PresentedSnapshot::pressButton(editor(), c.text);
+        break;
+    case AutomationCommand::Kind::Fill:
+        failure = PresentedSnapshot::fillField(editor(), c.target, c.text);
         break;
     case AutomationCommand::Kind::Screenshot:
         if (!entry_.window().grab().save(c.text, "PNG"))
@@ -293,6 +296,10 @@ bool AutomationDriver::holds(const AutomationCommand& c) {
         return !e->isExporting();
     if (c.target == QLatin1String("alert"))
         return PresentedSnapshot::alert(e) != nullptr;
+    if (c.target == QLatin1String("form"))
+        return PresentedSnapshot::isPublishingFormOnTop(e);
+    if (c.target == QLatin1String("publishing"))
+        return PresentedSnapshot::isPublishing(e);
     return false;
 }
 

@@ -1,10 +1,16 @@
 #include "PresentedSnapshot.h"
 
 #include "platform/ui/NavigationController.h"
+#include "platform/ui/ViewAlpha.h"
+#include "youtube/TXYouTubeActivityProgressOverlay.h"
 
+#include <QAbstractButton>
 #include <QApplication>
+#include <QKeyEvent>
+#include <QLineEdit>
 #include <QMouseEvent>
-#include <QPushButton>
+#include <QPlainTextEdit>
+#include <QTextEdit>
 
 using namespace platform;
 
@@ -15,13 +21,69 @@ QObject* objectProperty(QObject* object, const char* name) {
     return object ? object->property(name).value<QObject*>() : nullptr;
 }
 
-// The form's description cell: section 0, row 1 of its table.
-QObject* descriptionCell(ViewController* form) {
+// A cell of section 0 of the form's table: row 0 the title, row 1 the
+// description.
+QObject* formCell(ViewController* form, int row) {
     QObject* cell = nullptr;
     if (QObject* table = objectProperty(form, "_table"))
         QMetaObject::invokeMethod(table, "cellForRowAtIndexPath", Qt::DirectConnection,
-                                  Q_RETURN_ARG(QObject*, cell), Q_ARG(int, 0), Q_ARG(int, 1));
+                                  Q_RETURN_ARG(QObject*, cell), Q_ARG(int, 0), Q_ARG(int, row));
     return cell;
+}
+
+// A widget the user can see and reach: shown, and not faded out.
+bool reachable(const QWidget* widget) {
+    for (const QWidget* w = widget; w; w = w->parentWidget())
+        if (w->isHidden() || ViewAlpha::alpha(w) < 0.01)
+            return false;
+    return true;
+}
+
+void click(QWidget* widget) {
+    const QPointF centre = QRectF(widget->rect()).center();
+    QMouseEvent press(QEvent::MouseButtonPress, centre, widget->mapToGlobal(centre), Qt::LeftButton,
+                      Qt::LeftButton, Qt::NoModifier);
+    QApplication::sendEvent(widget, &press);
+    QMouseEvent release(QEvent::MouseButtonRelease, centre, widget->mapToGlobal(centre),
+                        Qt::LeftButton, Qt::NoButton, Qt::NoModifier);
+    QApplication::sendEvent(widget, &release);
+}
+
+void key(QWidget* widget, int code, Qt::KeyboardModifiers modifiers, const QString& text = {}) {
+    QKeyEvent press(QEvent::KeyPress, code, modifiers, text);
+    QApplication::sendEvent(widget, &press);
+    QKeyEvent release(QEvent::KeyRelease, code, modifiers, text);
+    QApplication::sendEvent(widget, &release);
+}
+
+// What a button says: its text without mnemonics, else its accessible name
+// (buttons that draw their title or icon themselves).
+QString titleOf(const QAbstractButton* button) {
+    QString text = button->text();
+    text.remove(QLatin1Char('&'));
+    return text.isEmpty() ? button->accessibleName() : text;
+}
+
+// The field of `cell` that takes typing: the cell itself or the first one
+// inside it.
+QWidget* editorIn(QWidget* cell) {
+    auto takesTyping = [](QWidget* widget) {
+        if (!reachable(widget) || !widget->isEnabled())
+            return false;
+        if (auto* line = qobject_cast<QLineEdit*>(widget))
+            return !line->isReadOnly();
+        if (auto* box = qobject_cast<QPlainTextEdit*>(widget))
+            return !box->isReadOnly();
+        if (auto* rich = qobject_cast<QTextEdit*>(widget))
+            return !rich->isReadOnly();
+        return false;
+    };
+    if (takesTyping(cell))
+        return cell;
+    for (QWidget* child : cell->findChildren<QWidget*>())
+        if (takesTyping(child))
+            return child;
+    return nullptr;
 }
 
 QJsonValue textOrNull(const QVariant& value) {
@@ -56,7 +118,7 @@ ViewController* publishingForm(ViewController* from) {
 QJsonObject dump(ViewController* from) {
     const Alert* shown = alert(from);
     ViewController* form = publishingForm(from);
-    QObject* cell = descriptionCell(form);
+    QObject* cell = formCell(form, 1);
     return QJsonObject{
         {QStringLiteral("alert"), shown ? QJsonValue(shown->title()) : QJsonValue()},
         {QStringLiteral("publishingDescription"),
@@ -70,30 +132,68 @@ QJsonObject dump(ViewController* from) {
     };
 }
 
-QString pressAlertAction(ViewController* from, const QString& title) {
-    Alert* shown = alert(from);
-    if (!shown)
-        return QStringLiteral("no alert is shown");
-    for (const auto& action : shown->actions()) {
-        if (action->title() != title)
+bool isPublishingFormOnTop(ViewController* from) {
+    ViewController* form = publishingForm(from);
+    return form && NavigationController::navigationControllerOf(form) == topOfChain(from);
+}
+
+bool isPublishing(ViewController* from) {
+    for (ViewController* c = from; c; c = c->presentedViewController()) {
+        if (!c->isViewLoaded())
             continue;
-        QPushButton* button = shown->buttonForAction(action.get());
-        if (!button || !button->isVisible() || !button->isEnabled())
-            return QStringLiteral("the alert's button %1 cannot be pressed").arg(title);
-        const QPointF centre = QRectF(button->rect()).center();
-        QMouseEvent press(QEvent::MouseButtonPress, centre, button->mapToGlobal(centre),
-                          Qt::LeftButton, Qt::LeftButton, Qt::NoModifier);
-        QApplication::sendEvent(button, &press);
-        QMouseEvent release(QEvent::MouseButtonRelease, centre, button->mapToGlobal(centre),
-                            Qt::LeftButton, Qt::NoButton, Qt::NoModifier);
-        QApplication::sendEvent(button, &release);
+        for (auto* overlay : c->view()->findChildren<TXYouTubeActivityProgressOverlay*>())
+            if (overlay->isShowing() && reachable(overlay))
+                return true;
+    }
+    return false;
+}
+
+QString pressButton(ViewController* from, const QString& title) {
+    ViewController* top = topOfChain(from);
+    if (!top || top == from)
+        return QStringLiteral("nothing is presented over the editor");
+    QStringList titles;
+    for (QAbstractButton* button : top->view()->findChildren<QAbstractButton*>()) {
+        if (!reachable(button))
+            continue;
+        const QString shown = titleOf(button);
+        if (shown != title) {
+            if (!shown.isEmpty())
+                titles.append(shown);
+            continue;
+        }
+        if (!button->isEnabled())
+            return QStringLiteral("the button %1 is disabled").arg(title);
+        click(button);
         return QString();
     }
-    QStringList titles;
-    for (const auto& action : shown->actions())
-        titles.append(action->title());
-    return QStringLiteral("the alert \"%1\" has no button %2 (it has: %3)")
-        .arg(shown->title(), title, titles.join(QStringLiteral(", ")));
+    if (const Alert* shown = qobject_cast<const Alert*>(top))
+        return QStringLiteral("the alert \"%1\" has no button %2 (it has: %3)")
+            .arg(shown->title(), title, titles.join(QStringLiteral(", ")));
+    return QStringLiteral("no button %1 on screen (there are: %2)")
+        .arg(title, titles.join(QStringLiteral(", ")));
+}
+
+QString fillField(ViewController* from, const QString& field, const QString& text) {
+    const int row = field == QLatin1String("title")         ? 0
+                    : field == QLatin1String("description") ? 1
+                                                            : -1;
+    if (row < 0)
+        return QStringLiteral("the form has no field %1 (title, description)").arg(field);
+    if (!publishingForm(from))
+        return QStringLiteral("no publishing form is shown");
+    if (!isPublishingFormOnTop(from))
+        return QStringLiteral("the publishing form is covered");
+    auto* cell = qobject_cast<QWidget*>(formCell(publishingForm(from), row));
+    QWidget* editor = cell ? editorIn(cell) : nullptr;
+    if (!editor)
+        return QStringLiteral("the form's %1 cannot be edited now").arg(field);
+    click(editor);
+    key(editor, Qt::Key_A, Qt::ControlModifier);
+    key(editor, Qt::Key_Delete, Qt::NoModifier);
+    if (!text.isEmpty())
+        key(editor, 0, Qt::NoModifier, text);
+    return QString();
 }
 
 } // namespace PresentedSnapshot

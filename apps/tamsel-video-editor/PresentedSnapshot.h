@@ -30,8 +30,22 @@ platform::ViewController* publishingForm(platform::ViewController* from);
 // (0 to 1); each null otherwise.
 QJsonObject dump(platform::ViewController* from);
 
-// Presses the button of the alert's action titled `title`, as the user's
-// mouse does. Empty on success, else why it could not.
-QString pressAlertAction(platform::ViewController* from, const QString& title);
+// Whether the publishing form is on top (no alert over it).
+bool isPublishingFormOnTop(platform::ViewController* from);
+
+// Whether the publishing progress overlay covers a presented screen and is
+// showing.
+bool isPublishing(platform::ViewController* from);
+
+// Presses the button titled `title` on the screen on top of the chain (an
+// alert's action, a navigation bar's item, a button of a form), as the
+// user's mouse does. Empty on success, else why it could not.
+QString pressButton(platform::ViewController* from, const QString& title);
+
+// Types `text` into the publishing form's field `field` ("title" or
+// "description": section 0, row 0 or 1 of its table) in place of what it
+// holds, as the user's mouse and keyboard do. Empty on success, else why it
+// could not.
+QString fillField(platform::ViewController* from, const QString& field, const QString& text);
 
 } // namespace PresentedSnapshot
