@@ -295,7 +295,7 @@ bool AutomationDriver::holds(const AutomationCommand& c) {
     if (c.target == QLatin1String("exporting=false"))
         return !e->isExporting();
     if (c.target == QLatin1String("alert"))
-        return PresentedSnapshot::alert(e) != nullptr;
+        return PresentedSnapshot::isAlertShown(e);
     if (c.target == QLatin1String("form"))
         return PresentedSnapshot::isPublishingFormOnTop(e);
     if (c.target == QLatin1String("publishing"))

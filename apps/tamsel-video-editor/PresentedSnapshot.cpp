@@ -1,5 +1,6 @@
 #include "PresentedSnapshot.h"
 
+#include "platform/ui/Animation.h"
 #include "platform/ui/NavigationController.h"
 #include "platform/ui/ViewAlpha.h"
 #include "youtube/TXYouTubeActivityProgressOverlay.h"
@@ -35,6 +36,17 @@ QObject* formCell(ViewController* form, int row) {
 bool reachable(const QWidget* widget) {
     for (const QWidget* w = widget; w; w = w->parentWidget())
         if (w->isHidden() || ViewAlpha::alpha(w) < 0.01)
+            return false;
+    return true;
+}
+
+// A view that is fully on screen: reachable, and neither it nor what holds
+// it is still fading.
+bool settled(const QWidget* widget) {
+    if (!reachable(widget))
+        return false;
+    for (const QWidget* w = widget; w; w = w->parentWidget())
+        if (Animation::isAnimating(w) || ViewAlpha::presentationAlpha(w) < 0.99)
             return false;
     return true;
 }
@@ -103,6 +115,11 @@ Alert* alert(ViewController* from) {
     return qobject_cast<Alert*>(topOfChain(from));
 }
 
+bool isAlertShown(ViewController* from) {
+    Alert* shown = alert(from);
+    return shown && shown->isViewLoaded() && settled(shown->view());
+}
+
 ViewController* publishingForm(ViewController* from) {
     for (ViewController* c = from; c; c = c->presentedViewController()) {
         auto* navigation = qobject_cast<NavigationController*>(c);
@@ -134,7 +151,8 @@ QJsonObject dump(ViewController* from) {
 
 bool isPublishingFormOnTop(ViewController* from) {
     ViewController* form = publishingForm(from);
-    return form && NavigationController::navigationControllerOf(form) == topOfChain(from);
+    return form && NavigationController::navigationControllerOf(form) == topOfChain(from) &&
+           form->isViewLoaded() && settled(form->view());
 }
 
 bool isPublishing(ViewController* from) {
@@ -142,7 +160,7 @@ bool isPublishing(ViewController* from) {
         if (!c->isViewLoaded())
             continue;
         for (auto* overlay : c->view()->findChildren<TXYouTubeActivityProgressOverlay*>())
-            if (overlay->isShowing() && reachable(overlay))
+            if (overlay->isShowing() && overlay->activityIndicator() && reachable(overlay))
                 return true;
     }
     return false;

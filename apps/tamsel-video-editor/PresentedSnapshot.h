@@ -19,6 +19,8 @@ platform::ViewController* topOfChain(platform::ViewController* from);
 
 // The alert on top of the chain, or null.
 platform::Alert* alert(platform::ViewController* from);
+// Whether an alert is on top and fully on screen.
+bool isAlertShown(platform::ViewController* from);
 
 // The upload form of a publishing agent in the chain (the root of a
 // navigation stack whose controller has a "_table"), or null.
@@ -30,11 +32,12 @@ platform::ViewController* publishingForm(platform::ViewController* from);
 // (0 to 1); each null otherwise.
 QJsonObject dump(platform::ViewController* from);
 
-// Whether the publishing form is on top (no alert over it).
+// Whether the publishing form is on top (no alert over it) and fully on
+// screen.
 bool isPublishingFormOnTop(platform::ViewController* from);
 
-// Whether the publishing progress overlay covers a presented screen and is
-// showing.
+// Whether the publishing progress overlay covers a presented screen, faded
+// in, its spinner turning.
 bool isPublishing(platform::ViewController* from);
 
 // Presses the button titled `title` on the screen on top of the chain (an

@@ -83,21 +83,25 @@ TEST(PresentedSnapshot, ReadsThePublishingFormAndPressesTheAlertsButtonsByTitle)
     auto navigation = NavigationController::initWithRootViewController(form);
     editor->presentViewController_animated_completion(navigation, false);
     ASSERT_EQ(PresentedSnapshot::publishingForm(editor), form.get());
-    EXPECT_TRUE(PresentedSnapshot::isPublishingFormOnTop(editor));
+    EXPECT_TRUE(waitUntil([&] { return PresentedSnapshot::isPublishingFormOnTop(editor); }));
     EXPECT_FALSE(PresentedSnapshot::isPublishing(editor));
 
+    // Publishing once the overlay has faded in and its spinner turns.
     auto* overlay = new TXYouTubeActivityProgressOverlay(navigation->view()->bounds());
     navigation->view()->addSubview(overlay);
     overlay->setShowing_animated(true, true);
-    EXPECT_TRUE(PresentedSnapshot::isPublishing(editor));
+    EXPECT_FALSE(PresentedSnapshot::isPublishing(editor));
+    EXPECT_TRUE(waitUntil([&] { return PresentedSnapshot::isPublishing(editor); }));
 
     int closes = 0;
     auto alert = Alert::make("Your video has been published.", QString());
     alert->addAction(AlertAction::make("View on YouTube", AlertAction::Style::Default));
     alert->addAction(
         AlertAction::make("Close", AlertAction::Style::Cancel, [&](AlertAction&) { ++closes; }));
-    navigation->presentViewController_animated_completion(alert, false);
+    navigation->presentViewController_animated_completion(alert, true);
     EXPECT_FALSE(PresentedSnapshot::isPublishingFormOnTop(editor));
+    EXPECT_FALSE(PresentedSnapshot::isAlertShown(editor)); // still fading in
+    EXPECT_TRUE(waitUntil([&] { return PresentedSnapshot::isAlertShown(editor); }));
 
     const QJsonObject shown = PresentedSnapshot::dump(editor);
     EXPECT_EQ(shown["alert"].toString(), "Your video has been published.");
@@ -112,6 +116,7 @@ TEST(PresentedSnapshot, ReadsThePublishingFormAndPressesTheAlertsButtonsByTitle)
     EXPECT_EQ(PresentedSnapshot::pressButton(editor, "Close"), "");
     EXPECT_TRUE(waitUntil([&] { return closes == 1; }));
     EXPECT_EQ(PresentedSnapshot::alert(editor), nullptr);
+    EXPECT_FALSE(PresentedSnapshot::isAlertShown(editor));
     EXPECT_TRUE(PresentedSnapshot::dump(editor)["alert"].isNull());
 }
 
@@ -128,7 +133,7 @@ TEST(PresentedSnapshot, TypesIntoTheFormsFieldsAndPressesItsNavigationButtons) {
     NavigationController::navigationItemOf(form.get())
         ->setRightBarButtonItem(ToolbarItem::titledItem("Publish", [&] { ++publishes; }));
     editor->presentViewController_animated_completion(navigation, false);
-    ASSERT_TRUE(waitUntil([&] { return form->table_.title->isVisible(); }));
+    ASSERT_TRUE(waitUntil([&] { return PresentedSnapshot::isPublishingFormOnTop(editor); }));
 
     EXPECT_EQ(PresentedSnapshot::fillField(editor, "title", "My run"), "");
     EXPECT_EQ(PresentedSnapshot::fillField(editor, "description", "Lap one, lap two"), "");
