@@ -5,18 +5,11 @@
 #include "platform/ui/Alert.h"
 #include "platform/ui/UrlOpener.h"
 #include "support/FrameworkStrings.h"
+#include "support/StringFormat.h"
 
 using namespace platform;
 
 namespace {
-
-// The localised format's one "%@" filled with `argument`.
-QString formatWithArgument(QString format, const QString& argument) {
-    const qsizetype at = format.indexOf(QStringLiteral("%@"));
-    if (at >= 0)
-        format.replace(at, 2, argument);
-    return format;
-}
 
 View* viewOfNavigationController(TXPublishingAgent* agent) {
     const auto navigationController = agent ? agent->navigationController() : nullptr;
@@ -66,9 +59,9 @@ void TXYouTubeActivity::showAlertWithError(ErrorPtr error) {
     } else {
         alert = Alert::make(TXLocalizedFrameworkString(QStringLiteral("PUBLISHED_VIDEO")),
                             QString(), Alert::Style::Alert);
-        const QString viewTitle = formatWithArgument(
-            TXLocalizedFrameworkString(QStringLiteral("VIEW_BUTTON_TITLE_FORMAT")),
-            activityTitle());
+        const QString viewTitle =
+            stringWithFormat(TXLocalizedFrameworkString(QStringLiteral("VIEW_BUTTON_TITLE_FORMAT")),
+                             {activityTitle()});
         alert->addAction(
             AlertAction::make(viewTitle, AlertAction::Style::Default, [weakSelf](AlertAction&) {
                 const auto self = weakSelf.lock();

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "FakeExportSession.h"
+#include "ControlledExportSession.h"
 #include "FakePluginLoader.h"
 #include "FakePublishingAgent.h"
 #include "RecordingUrlOpener.h"
@@ -38,7 +38,7 @@ class ActivityFixture : public ::testing::Test {
 
     testing_support::MobileRoot device;
     testing_support::ScopedEnv language; // English unless a test says otherwise
-    FakeExportSessions exports;
+    ControlledExportSessions exports;
     FakePluginLoaderInPlace loader{&FakePublishingAgent::staticMetaObject};
     RecordingUrlOpener opener;
     testing_support::LogCapture log;

@@ -7,9 +7,9 @@
 
 // An export session that records how it was set up and finishes when the
 // test says so (on the test's thread).
-class FakeExportSession : public platform::ExportSession {
+class ControlledExportSession : public platform::ExportSession {
   public:
-    FakeExportSession(std::shared_ptr<platform::Asset> asset, QString presetName)
+    ControlledExportSession(std::shared_ptr<platform::Asset> asset, QString presetName)
         : asset_(std::move(asset)), preset_(std::move(presetName)) {}
 
     std::shared_ptr<platform::Asset> asset() const override { return asset_; }
@@ -53,19 +53,20 @@ class FakeExportSession : public platform::ExportSession {
     std::function<void()> handler_;
 };
 
-// Puts FakeExportSession in the real session's place for its lifetime and
+// Puts ControlledExportSession in the real session's place for its lifetime and
 // keeps every session made.
-class FakeExportSessions {
+class ControlledExportSessions {
   public:
-    FakeExportSessions()
+    ControlledExportSessions()
         : replacement_(platform::ExportSession::implementation().replace(
               [this](std::shared_ptr<platform::Asset> asset, const QString& preset) {
-                  auto session = std::make_shared<FakeExportSession>(std::move(asset), preset);
+                  auto session =
+                      std::make_shared<ControlledExportSession>(std::move(asset), preset);
                   made.append(session);
                   return std::static_pointer_cast<platform::ExportSession>(session);
               })) {}
 
-    QList<std::shared_ptr<FakeExportSession>> made;
+    QList<std::shared_ptr<ControlledExportSession>> made;
 
   private:
     platform::Implementation<platform::ExportSession::Maker>::Replacement replacement_;
