@@ -1,6 +1,7 @@
 #include "AutomationDriver.h"
 
 #include "EditorSnapshot.h"
+#include "PresentedSnapshot.h"
 #include "overlay/TXVideoOverlayButton.h"
 #include "platform/runtime/Log.h"
 #include "platform/ui/ViewAlpha.h"
@@ -108,11 +109,20 @@ void AutomationDriver::runNext() {
     case AutomationCommand::Kind::Resize:
         entry_.window().resize(int(c.value), int(c.value2));
         break;
-    case AutomationCommand::Kind::Dump:
-        std::printf("%s\n", QJsonDocument(EditorSnapshot::dump(*editor()))
-                                .toJson(QJsonDocument::Compact)
-                                .constData());
+    case AutomationCommand::Kind::Dump: {
+        QJsonObject state = EditorSnapshot::dump(*editor());
+        const QJsonObject presented = PresentedSnapshot::dump(editor());
+        for (auto it = presented.begin(); it != presented.end(); ++it)
+            state.insert(it.key(), it.value());
+        std::printf("%s\n", QJsonDocument(state).toJson(QJsonDocument::Compact).constData());
         std::fflush(stdout);
+        break;
+    }
+    case AutomationCommand::Kind::Press:
+        failure = PresentedSnapshot::pressButton(editor(), c.text);
+        break;
+    case AutomationCommand::Kind::Fill:
+        failure = PresentedSnapshot::fillField(editor(), c.target, c.text);
         break;
     case AutomationCommand::Kind::Screenshot:
         if (qEnvironmentVariableIsSet("DBG_TREE")) {
@@ -325,6 +335,12 @@ bool AutomationDriver::holds(const AutomationCommand& c) {
         return e->avPlayer->rate() == 0;
     if (c.target == QLatin1String("exporting=false"))
         return !e->isExporting();
+    if (c.target == QLatin1String("alert"))
+        return PresentedSnapshot::isAlertShown(e);
+    if (c.target == QLatin1String("form"))
+        return PresentedSnapshot::isPublishingFormOnTop(e);
+    if (c.target == QLatin1String("publishing"))
+        return PresentedSnapshot::isPublishing(e);
     return false;
 }
 

@@ -35,6 +35,32 @@ dismiss
     EXPECT_EQ((*script)[9].kind, Kind::Dismiss);
 }
 
+TEST(AutomationScript, FillsTheFormPressesButtonsByTitleAndWaitsForPublishing) {
+    QString error;
+    const auto script = parseAutomationScript(R"(wait form
+fill title "My run"
+fill description ""
+press "Publish"
+wait publishing 5
+wait alert 90
+press "View on YouTube"
+)",
+                                              &error);
+    ASSERT_TRUE(script) << error.toStdString();
+    ASSERT_EQ(script->size(), 7);
+    EXPECT_EQ((*script)[0].target, "form");
+    EXPECT_EQ((*script)[1].kind, Kind::Fill);
+    EXPECT_EQ((*script)[1].target, "title");
+    EXPECT_EQ((*script)[1].text, "My run");
+    EXPECT_EQ((*script)[2].text, "");
+    EXPECT_EQ((*script)[3].kind, Kind::Press);
+    EXPECT_EQ((*script)[4].target, "publishing");
+    EXPECT_DOUBLE_EQ((*script)[5].timeout, 90);
+    EXPECT_EQ((*script)[6].text, "View on YouTube");
+    for (const char* bad : {"press View on YouTube", "fill tags x", "fill title", "press"})
+        EXPECT_FALSE(parseAutomationScript(bad, &error)) << bad;
+}
+
 TEST(AutomationScript, RefusesAnythingElseNamingTheLine) {
     const char* bad[] = {"tap",           "tap a b",      "drag middle 3", "drag end -1",
                          "drag end soon", "wait forever", "wait log",      "wait ready 0",
