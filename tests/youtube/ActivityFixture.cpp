@@ -10,9 +10,9 @@ ActivityFixture::ActivityFixture() {
     language.unset("LANGUAGE");
     language.set("LANG", "en_US.UTF-8");
     device.makeLibrary();
-    testmedia::MovieSpec spec;
-    spec.seconds = 1;
-    moviePath = mediatest::movieFor(spec);
+    testmedia::MovieSpec shape;
+    shape.seconds = 1;
+    moviePath = mediatest::movieFor(shape);
     FakePublishingAgent::nextFormHasMembers = true;
     activity = TXYouTubeActivity::init();
     activity->setFinishHandler([this](bool completed) {

@@ -57,10 +57,10 @@ class PublishEndToEnd : public ::testing::Test {
 
     static void SetUpTestSuite() {
         movies = new QTemporaryDir;
-        testmedia::MovieSpec spec;
-        spec.seconds = 3;
+        testmedia::MovieSpec shape;
+        shape.seconds = 3;
         QString error;
-        ASSERT_TRUE(testmedia::writeMovie(recording(), spec, &error)) << error.toStdString();
+        ASSERT_TRUE(testmedia::writeMovie(recording(), shape, &error)) << error.toStdString();
     }
     static void TearDownTestSuite() {
         delete movies;
