@@ -143,8 +143,11 @@ void MpvPlayer::load(std::uint64_t generation) {
     const std::shared_ptr<Asset>& asset = item_->asset();
     const QString hostPath = DevicePaths::hostPathOfUrl(asset->url());
     if (hostPath.isEmpty()) {
+        // An item on no URL at all is what an editor holds before its movie
+        // is known: it fails as any other, but is nothing worth a log line.
         failItem(makeError(-EPROTONOSUPPORT, mediaErrorDomain(),
-                           QStringLiteral("not a local file: %1").arg(asset->url().toString())));
+                           QStringLiteral("not a local file: %1").arg(asset->url().toString())),
+                 /*quietly=*/asset->url().isEmpty());
         return;
     }
     if (asset->tracks().isEmpty()) {
@@ -161,10 +164,11 @@ void MpvPlayer::load(std::uint64_t generation) {
     core_->command({"loadfile", hostPath.toUtf8(), "replace"}, kLoadReplyBase + generation_);
 }
 
-void MpvPlayer::failItem(ErrorPtr error) {
+void MpvPlayer::failItem(ErrorPtr error, bool quietly) {
     if (!error)
         error = makeError(-EINVAL, mediaErrorDomain(), QStringLiteral("the item cannot be played"));
-    logError(QStringLiteral("player: item failed: %1").arg(error->message()));
+    if (!quietly)
+        logError(QStringLiteral("player: item failed: %1").arg(error->message()));
     if (core_ && loaded_)
         core_->command({"stop"});
     loaded_ = false;

@@ -65,7 +65,7 @@ class MpvPlayer final : public Player, public std::enable_shared_from_this<MpvPl
 
     // MpvPlayer.cpp
     void load(std::uint64_t generation);
-    void failItem(ErrorPtr error);
+    void failItem(ErrorPtr error, bool quietly = false);
     void seek(const MediaTime& time, const QByteArray& mode, SeekCompletion completion);
     void issueSeek();
     void finishSeeks(bool finished);
