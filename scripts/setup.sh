@@ -4,13 +4,16 @@
 set -euo pipefail
 
 packages=(
+  clang-format # the formatting check of .ci/run
   build-essential cmake ninja-build pkg-config git ccache
   qt6-base-dev libqt6opengl6-dev qt6-multimedia-dev qt6-base-dev-tools
   libavformat-dev libavcodec-dev libavutil-dev libswscale-dev libswresample-dev
   libmpv-dev libappstream-dev
   libgtest-dev libgmock-dev libbenchmark-dev
-  xvfb xauth ffmpeg hyperfine
+  xvfb xauth ffmpeg dbus-daemon
   libgl1-mesa-dri libegl1 fonts-dejavu-core adwaita-icon-theme
+  qt6-networkauth-dev qtkeychain-qt6-dev libsecret-1-0 gnome-keyring curl hyperfine
+  dpkg-dev desktop-file-utils appstream
 )
 
 missing=()

@@ -7,5 +7,5 @@ tamsel_add_tests(tamsel_hosting_tests unit
 
 tamsel_add_tests(tamsel_launcher_tests integration
   SOURCES hosting/LauncherTest.cpp hosting/TamselEditTest.cpp
-  LIBS tamsel-host)
+  LIBS tamsel_platform_host)
 add_dependencies(tamsel_launcher_tests tamsel_echo_extension tamsel-edit)

@@ -16,6 +16,7 @@ tamsel_add_tests(tamsel_ui_tests unit
     ui/ImagesTest.cpp
     ui/DeviceAndInputTest.cpp
     ui/ViewsTest.cpp
+    ui/ShortcutMapTest.cpp
   LIBS tamsel_platform_ui Qt6::Test
   MAIN tamsel_ui_test_main)
 

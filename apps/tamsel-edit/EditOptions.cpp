@@ -1,7 +1,5 @@
 #include "EditOptions.h"
 
-#include "extension/TXVideoEditorExtensionKeys.h"
-
 #include <QFileInfo>
 
 QString EditOptions::usage() {
@@ -84,21 +82,14 @@ std::optional<EditOptions> EditOptions::parse(const QStringList& arguments,
     return options;
 }
 
-QList<platform::ExtensionItem> EditOptions::inputItems() const {
-    using platform::ItemProvider;
-    QList<platform::ExtensionItem> items{
-        {TXVideoEditorExtensionMoviePathKey, {ItemProvider::withItem(moviePath)}},
-        {TXVideoEditorExtensionAppNameKey, {ItemProvider::withItem(appName)}},
-        {TXVideoEditorExtensionBundleIdentifierKey, {ItemProvider::withItem(bundleIdentifier)}},
-    };
-    if (!attachmentPath.isEmpty())
-        items.append(
-            {TXVideoEditorExtensionFileAttachmentKey, {ItemProvider::withItem(attachmentPath)}});
-    if (!shareMessage.isNull())
-        items.append({TXVideoEditorExtensionOverrideShareMessageKey,
-                      {ItemProvider::withItem(shareMessage)}});
-    if (tintColor.isValid())
-        items.append(
-            {TXVideoEditorExtensionOverrideTintColorKey, {ItemProvider::withItem(tintColor)}});
-    return items;
+tamsel::VideoEditorRequest EditOptions::request() const {
+    tamsel::VideoEditorRequest request;
+    request.moviePath = moviePath;
+    request.appName = appName;
+    request.bundleIdentifier = bundleIdentifier;
+    request.attachmentPath = attachmentPath;
+    request.shareMessage = shareMessage;
+    request.tintColor = tintColor;
+    request.editorArguments = extensionArguments;
+    return request;
 }

@@ -1,6 +1,6 @@
 #pragma once
 
-#include "platform/hosting/ExtensionItem.h"
+#include <tamsel/VideoEditorHost.h>
 
 #include <QColor>
 #include <QString>
@@ -25,8 +25,8 @@ struct EditOptions {
                                             const QString& defaultMovie,
                                             const QString& defaultExtension, QString* error);
 
-    // The six input items, in the order a host sends them.
-    QList<platform::ExtensionItem> inputItems() const;
+    // The request a host makes of the editor.
+    tamsel::VideoEditorRequest request() const;
 
     static QString usage();
 };

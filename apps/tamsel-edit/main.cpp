@@ -1,9 +1,8 @@
 // The host side: starts the editor extension in a process of its own, hands it
 // the input items, and prints the activity types the user completed as one
-// JSON array on stdout.
+// JSON array on stdout. Built on the tamsel-host library, as a recorder is.
 
 #include "EditOptions.h"
-#include "platform/hosting/host/ExtensionLauncher.h"
 
 #include <QCoreApplication>
 #include <QDir>
@@ -42,35 +41,20 @@ int main(int argc, char** argv) {
         return 2;
     }
 
-    platform::ExtensionLauncher launcher;
-    std::optional<QStringList> reported;
-    QObject::connect(&launcher, &platform::ExtensionLauncher::extensionDidFinishWithActivityTypes,
-                     [&](const QStringList& activityTypes) {
-                         // The user is done: the host takes the list and closes the editor.
-                         if (reported)
-                             return;
-                         reported = activityTypes;
-                         print(activityTypes);
-                         launcher.dismiss();
-                     });
+    tamsel::VideoEditorHost editor;
+    editor.setEditorProgram(options->extensionProgram);
     int status = 0;
-    QObject::connect(
-        &launcher, &platform::ExtensionLauncher::extensionEnded, [&](int exitCode, bool crashed) {
-            if (crashed) {
-                std::fprintf(stderr, "tamsel-edit: the editor ended abnormally (%s %d)\n",
-                             launcher.process().exitStatus() == QProcess::CrashExit ? "crash,"
-                                                                                    : "exit status",
-                             exitCode);
-                status = 1;
-            } else if (!reported) {
-                // The window was closed: the editor was dismissed with nothing done.
-                print({});
-            }
-            app.quit();
-        });
-
-    if (!launcher.start(options->extensionProgram, options->extensionArguments,
-                        options->inputItems(), &error)) {
+    QObject::connect(&editor, &tamsel::VideoEditorHost::finished, print);
+    QObject::connect(&editor, &tamsel::VideoEditorHost::ended,
+                     [&](bool abnormal, const QString& how) {
+                         if (abnormal) {
+                             std::fprintf(stderr, "tamsel-edit: the editor ended abnormally (%s)\n",
+                                          qPrintable(how));
+                             status = 1;
+                         }
+                         app.quit();
+                     });
+    if (!editor.open(options->request(), &error)) {
         std::fprintf(stderr, "tamsel-edit: cannot start the editor: %s\n", qPrintable(error));
         return 1;
     }

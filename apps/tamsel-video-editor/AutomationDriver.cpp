@@ -1,14 +1,19 @@
 #include "AutomationDriver.h"
 
 #include "EditorSnapshot.h"
+#include "PresentedSnapshot.h"
 #include "overlay/TXVideoOverlayButton.h"
 #include "platform/runtime/Log.h"
 #include "platform/ui/ViewAlpha.h"
+#include "platform/ui/share/ActivitySheet.h"
 
 #include <QApplication>
 #include <QDeadlineTimer>
 #include <QJsonDocument>
+#include <QKeyEvent>
+#include <QListWidget>
 #include <QMouseEvent>
+#include <QPointer>
 #include <QTimer>
 #include <cstdio>
 
@@ -22,10 +27,13 @@ void sendMouse(QWidget* widget, QEvent::Type type, const QPointF& local, Qt::Mou
     QApplication::sendEvent(widget, &event);
 }
 
+void click(QWidget* widget, const QPointF& at) {
+    sendMouse(widget, QEvent::MouseButtonPress, at, Qt::LeftButton);
+    sendMouse(widget, QEvent::MouseButtonRelease, at, Qt::NoButton);
+}
+
 void click(QWidget* widget) {
-    const QPointF centre = QRectF(widget->rect()).center();
-    sendMouse(widget, QEvent::MouseButtonPress, centre, Qt::LeftButton);
-    sendMouse(widget, QEvent::MouseButtonRelease, centre, Qt::NoButton);
+    click(widget, QRectF(widget->rect()).center());
 }
 
 // A widget the user can see and reach: shown, and not faded out.
@@ -92,19 +100,43 @@ void AutomationDriver::runNext() {
     case AutomationCommand::Kind::Drag:
         failure = drag(c.target, c.value);
         break;
+    case AutomationCommand::Kind::Key:
+        key(QKeySequence::fromString(c.text, QKeySequence::PortableText));
+        break;
     case AutomationCommand::Kind::Shake:
         entry_.window().shake();
         break;
     case AutomationCommand::Kind::Resize:
         entry_.window().resize(int(c.value), int(c.value2));
         break;
-    case AutomationCommand::Kind::Dump:
-        std::printf("%s\n", QJsonDocument(EditorSnapshot::dump(*editor()))
-                                .toJson(QJsonDocument::Compact)
-                                .constData());
+    case AutomationCommand::Kind::Dump: {
+        QJsonObject state = EditorSnapshot::dump(*editor());
+        const QJsonObject presented = PresentedSnapshot::dump(editor());
+        for (auto it = presented.begin(); it != presented.end(); ++it)
+            state.insert(it.key(), it.value());
+        std::printf("%s\n", QJsonDocument(state).toJson(QJsonDocument::Compact).constData());
         std::fflush(stdout);
         break;
+    }
+    case AutomationCommand::Kind::Press:
+        failure = PresentedSnapshot::pressButton(editor(), c.text);
+        break;
+    case AutomationCommand::Kind::Fill:
+        failure = PresentedSnapshot::fillField(editor(), c.target, c.text);
+        break;
     case AutomationCommand::Kind::Screenshot:
+        if (qEnvironmentVariableIsSet("DBG_TREE")) {
+            QWidget& w = entry_.window();
+            for (QWidget* c : w.findChildren<QWidget*>())
+                if (c->isVisible()) {
+                    QRect g(c->mapTo(&w, QPoint(0, 0)), c->size());
+                    std::fprintf(stderr, "DBG %s %s parent=%s %d,%d %dx%d auto=%d\n",
+                                 c->metaObject()->className(), qPrintable(c->objectName()),
+                                 c->parentWidget() ? c->parentWidget()->metaObject()->className()
+                                                   : "",
+                                 g.x(), g.y(), g.width(), g.height(), c->autoFillBackground());
+                }
+        }
         if (!entry_.window().grab().save(c.text, "PNG"))
             failure = QStringLiteral("cannot write %1").arg(c.text);
         break;
@@ -118,6 +150,9 @@ void AutomationDriver::runNext() {
         return;
     case AutomationCommand::Kind::Wait:
         wait(c);
+        return;
+    case AutomationCommand::Kind::Share:
+        retry([this, target = c.target] { return share(target); }, c.timeout);
         return;
     }
     if (!failure.isEmpty()) {
@@ -186,6 +221,95 @@ QString AutomationDriver::drag(const QString& part, double seconds) {
     return QString();
 }
 
+QString AutomationDriver::share(const QString& typeOrTitle) {
+    TXVideoEditorViewController* e = editor();
+    auto* sheet = e ? dynamic_cast<ActivityViewController*>(e->presentedViewController()) : nullptr;
+    if (!sheet || sheet->hasReported())
+        return QStringLiteral("no share sheet is open (tap shareButton first)");
+    auto* real = dynamic_cast<ActivitySheet*>(sheet);
+    QListWidget* list = real ? real->activityList() : nullptr;
+    if (typeOrTitle == QLatin1String("cancel")) {
+        if (list && reachable(list)) {
+            QKeyEvent press(QEvent::KeyPress, Qt::Key_Escape, Qt::NoModifier);
+            QApplication::sendEvent(list, &press);
+        } else {
+            sheet->cancel();
+        }
+        return QString();
+    }
+    std::shared_ptr<Activity> picked;
+    QStringList offered;
+    for (const auto& activity : sheet->offeredActivities()) {
+        offered.append(activity->activityType());
+        if (!picked && (activity->activityType() == typeOrTitle ||
+                        activity->activityTitle().compare(typeOrTitle, Qt::CaseInsensitive) == 0))
+            picked = activity;
+    }
+    if (!picked)
+        return QStringLiteral("the sheet offers no %1 (it offers %2)")
+            .arg(typeOrTitle, offered.join(QStringLiteral(", ")));
+    if (list && reachable(list)) {
+        for (int row = 0; row < list->count(); ++row) {
+            QListWidgetItem* item = list->item(row);
+            if (item->data(Qt::UserRole).toString() != picked->activityType())
+                continue;
+            list->scrollToItem(item);
+            click(list->viewport(), QRectF(list->visualItemRect(item)).center());
+            return QString();
+        }
+        return QStringLiteral("%1 is offered but not listed yet").arg(typeOrTitle);
+    }
+    sheet->performActivityNamed(picked->activityType());
+    return QString();
+}
+
+void AutomationDriver::retry(std::function<QString()> attempt, double timeout) {
+    retrying_ = std::move(attempt);
+    waitDeadline_ = QDeadlineTimer(qint64(timeout * 1000));
+    pollRetry();
+}
+
+void AutomationDriver::pollRetry() {
+    if (done_)
+        return;
+    const QString why = retrying_();
+    if (why.isEmpty()) {
+        ++next_;
+        QTimer::singleShot(0, this, &AutomationDriver::runNext);
+        return;
+    }
+    if (waitDeadline_.hasExpired()) {
+        finish(why);
+        return;
+    }
+    QTimer::singleShot(20, this, &AutomationDriver::pollRetry);
+}
+
+void AutomationDriver::key(const QKeySequence& sequence) {
+    // Keys go where the user's keys go: to the focused control, and from
+    // there up to the window when the control does not take them.
+    QWidget* window = &entry_.window();
+    QWidget* target = window->focusWidget() ? window->focusWidget() : window;
+    const QKeyCombination combination = sequence[0];
+    const Qt::Key k = combination.key();
+    QString text;
+    if (!(combination.keyboardModifiers() & (Qt::ControlModifier | Qt::AltModifier))) {
+        if (k == Qt::Key_Space)
+            text = QStringLiteral(" ");
+        else if (k >= Qt::Key_A && k <= Qt::Key_Z)
+            text =
+                QChar(combination.keyboardModifiers() & Qt::ShiftModifier ? 'A' + (k - Qt::Key_A)
+                                                                          : 'a' + (k - Qt::Key_A));
+    }
+    QPointer<QWidget> guard(target);
+    QKeyEvent press(QEvent::KeyPress, k, combination.keyboardModifiers(), text);
+    QApplication::sendEvent(target, &press);
+    if (!guard)
+        target = window;
+    QKeyEvent release(QEvent::KeyRelease, k, combination.keyboardModifiers(), text);
+    QApplication::sendEvent(target, &release);
+}
+
 bool AutomationDriver::holds(const AutomationCommand& c) {
     if (c.target == QLatin1String("log")) {
         std::lock_guard lock(logMutex_);
@@ -211,6 +335,12 @@ bool AutomationDriver::holds(const AutomationCommand& c) {
         return e->avPlayer->rate() == 0;
     if (c.target == QLatin1String("exporting=false"))
         return !e->isExporting();
+    if (c.target == QLatin1String("alert"))
+        return PresentedSnapshot::isAlertShown(e);
+    if (c.target == QLatin1String("form"))
+        return PresentedSnapshot::isPublishingFormOnTop(e);
+    if (c.target == QLatin1String("publishing"))
+        return PresentedSnapshot::isPublishing(e);
     return false;
 }
 

@@ -1,5 +1,6 @@
 #include "AutomationScript.h"
 
+#include <QKeySequence>
 #include <QRegularExpression>
 #include <cmath>
 
@@ -80,11 +81,38 @@ std::optional<QList<AutomationCommand>> parseAutomationScript(const QString& tex
             c.kind = verb == QLatin1String("shake")  ? AutomationCommand::Kind::Shake
                      : verb == QLatin1String("dump") ? AutomationCommand::Kind::Dump
                                                      : AutomationCommand::Kind::Dismiss;
+        } else if (verb == QLatin1String("share")) {
+            // The sheet comes once the store has answered: the command waits
+            // for it, and for the activity to be offered.
+            if (w.size() != 2)
+                return fail(QStringLiteral("share takes an activity type or title, or cancel"));
+            c.kind = AutomationCommand::Kind::Share;
+            c.target = w[1];
+            c.timeout = 10;
         } else if (verb == QLatin1String("screenshot")) {
             if (w.size() != 2)
                 return fail(QStringLiteral("screenshot takes a file name"));
             c.kind = AutomationCommand::Kind::Screenshot;
             c.text = w[1];
+        } else if (verb == QLatin1String("key")) {
+            const QKeySequence key =
+                w.size() == 2 ? QKeySequence::fromString(w[1], QKeySequence::PortableText)
+                              : QKeySequence();
+            if (key.count() != 1 || key[0].key() == Qt::Key_unknown)
+                return fail(QStringLiteral("key takes one key, such as Space, I or Ctrl+S"));
+            c.kind = AutomationCommand::Kind::Key;
+            c.text = key.toString(QKeySequence::PortableText);
+        } else if (verb == QLatin1String("press")) {
+            if (w.size() != 2)
+                return fail(QStringLiteral("press takes the title of a button"));
+            c.kind = AutomationCommand::Kind::Press;
+            c.text = w[1];
+        } else if (verb == QLatin1String("fill")) {
+            if (w.size() != 3 || !QStringList{"title", "description"}.contains(w[1]))
+                return fail(QStringLiteral("fill takes title or description and a text"));
+            c.kind = AutomationCommand::Kind::Fill;
+            c.target = w[1];
+            c.text = w[2];
         } else if (verb == QLatin1String("resize")) {
             std::optional<double> width, height;
             if (w.size() != 3 || !(width = number(w[1], true)) || !(height = number(w[2], true)))
@@ -109,7 +137,8 @@ std::optional<QList<AutomationCommand>> parseAutomationScript(const QString& tex
                     return fail(QStringLiteral("wait log takes a text"));
                 c.text = w[2];
                 next = 3;
-            } else if (!QStringList{"ready", "frame", "playing", "paused", "exporting=false"}
+            } else if (!QStringList{"ready", "frame", "playing", "paused", "exporting=false",
+                                    "alert", "form", "publishing"}
                             .contains(c.target)) {
                 return fail(QStringLiteral("cannot wait for %1").arg(c.target));
             }

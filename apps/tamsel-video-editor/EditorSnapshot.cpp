@@ -1,5 +1,7 @@
 #include "EditorSnapshot.h"
 
+#include "platform/ui/share/ActivityViewController.h"
+
 #include <QJsonArray>
 #include <cmath>
 
@@ -36,6 +38,22 @@ QJsonArray itemNames(TXVideoEditorViewController& editor, const platform::Toolba
     return names;
 }
 
+// The open share sheet: what it offers, in order, and its items as text.
+QJsonValue shareSheet(TXVideoEditorViewController& editor) {
+    auto* sheet = dynamic_cast<platform::ActivityViewController*>(editor.presentedViewController());
+    if (!sheet || sheet->hasReported())
+        return QJsonValue::Null;
+    QJsonArray offered;
+    for (const auto& activity : sheet->offeredActivities())
+        offered.append(activity->activityType());
+    return QJsonObject{
+        {QStringLiteral("activityTypes"), offered},
+        {QStringLiteral("items"),
+         QJsonArray::fromStringList(
+             platform::ActivityViewController::describeItems(sheet->activityItems()))},
+    };
+}
+
 } // namespace
 
 std::shared_ptr<ToolbarItem> itemNamed(TXVideoEditorViewController& editor, const QString& name) {
@@ -50,6 +68,43 @@ QString nameOfItem(TXVideoEditorViewController& editor, const ToolbarItem* item)
         if (candidate.get() == item)
             return itemName;
     return QString();
+}
+
+QString focusedControl(TXVideoEditorViewController& editor) {
+    const QWidget* focus = editor.isViewLoaded() ? editor.view()->window()->focusWidget() : nullptr;
+    if (!focus)
+        return QString();
+    if (focus == editor.avTrimmer.get())
+        return QStringLiteral("avTrimmer");
+    for (const QWidget* overlay = focus; overlay; overlay = overlay->parentWidget())
+        if (overlay == editor.videoOverlayPlayButtonView.get())
+            return QStringLiteral("videoOverlayPlayButton");
+    for (platform::Toolbar* bar : {editor.topToolBar.get(), editor.bottomToolBar.get()})
+        for (const auto& item : bar ? bar->items() : platform::Toolbar::ItemList())
+            if (bar->widgetForItem(item.get()) == focus)
+                return nameOfItem(editor, item.get());
+    return QString::fromLatin1(focus->metaObject()->className());
+}
+
+QJsonObject frames(TXVideoEditorViewController& editor) {
+    QJsonObject out;
+    if (!editor.isViewLoaded())
+        return out;
+    const QWidget* window = editor.view()->window();
+    auto add = [&](const QString& name, const QWidget* w) {
+        if (!w || !w->isVisibleTo(window) || !window->isAncestorOf(w))
+            return;
+        const QPoint at = w->mapTo(window, QPoint(0, 0));
+        out.insert(name, QJsonArray{at.x(), at.y(), w->width(), w->height()});
+    };
+    add(QStringLiteral("topToolBar"), editor.topToolBar.get());
+    add(QStringLiteral("bottomToolBar"), editor.bottomToolBar.get());
+    add(QStringLiteral("avTrimmer"), editor.avTrimmer.get());
+    add(QStringLiteral("videoOverlayPlayButton"), editor.videoOverlayPlayButtonView.get());
+    for (platform::Toolbar* bar : {editor.topToolBar.get(), editor.bottomToolBar.get()})
+        for (const auto& item : bar ? bar->items() : platform::Toolbar::ItemList())
+            add(nameOfItem(editor, item.get()), bar->widgetForItem(item.get()));
+    return out;
 }
 
 QJsonObject dump(TXVideoEditorViewController& editor) {
@@ -71,6 +126,9 @@ QJsonObject dump(TXVideoEditorViewController& editor) {
         {QStringLiteral("bottomToolBar"),
          bottomInView ? itemNames(editor, editor.bottomToolBar.get()) : QJsonArray()},
         {QStringLiteral("activityTypes"), QJsonArray::fromStringList(editor.activityTypes)},
+        {QStringLiteral("shareSheet"), shareSheet(editor)},
+        {QStringLiteral("focus"), focusedControl(editor)},
+        {QStringLiteral("frames"), frames(editor)},
     };
 }
 

@@ -6,7 +6,10 @@
 using namespace platform;
 
 ExtensionEntry::ExtensionEntry(std::unique_ptr<ExtensionEndpoint> endpoint)
-    : endpoint_(std::move(endpoint)) {
+    : endpoint_(std::move(endpoint)),
+      keyboard_(new EditorKeyboard(&window_, [this]() -> TXVideoEditorViewController* {
+          return principal_ ? principal_->videoEditorViewController.get() : nullptr;
+      })) {
     window_.setWindowTitle(QStringLiteral("Tamsel"));
     window_.resize(960, 600);
     window_.installEventFilter(this);
@@ -18,6 +21,11 @@ ExtensionEntry::ExtensionEntry(std::unique_ptr<ExtensionEndpoint> endpoint)
 bool ExtensionEntry::eventFilter(QObject* watched, QEvent* event) {
     if (watched == &window_ && event->type() == QEvent::Close)
         QTimer::singleShot(0, this, &ExtensionEntry::endRequest);
+    // The principal shows the editor by adding its view: its controls are
+    // there to be labelled with their keys.
+    if (principal_ && principal_->isViewLoaded() && watched == principal_->view() &&
+        event->type() == QEvent::ChildAdded)
+        keyboard_->editorDidAppear();
     return QObject::eventFilter(watched, event);
 }
 
@@ -36,6 +44,7 @@ void ExtensionEntry::beginRequest(const QList<ExtensionItem>& inputItems) {
     principal_->extensionContext = context_;
     context_->setPrincipalObject(principal_);
     window_.setRootViewController(principal_);
+    principal_->view()->installEventFilter(this);
     window_.show();
     emit requestBegan();
 }

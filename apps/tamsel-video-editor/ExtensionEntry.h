@@ -1,5 +1,6 @@
 #pragma once
 
+#include "EditorKeyboard.h"
 #include "extension/TXVideoEditorExtensionContext.h"
 #include "extension/TXVideoEditorExtensionViewController.h"
 #include "platform/hosting/ExtensionEndpoint.h"
@@ -10,8 +11,9 @@
 
 // What the platform does for an extension request: it makes the context and
 // the principal view controller and shows the controller in a window of its
-// own. The window closing, the host dismissing the editor and the host going
-// away all end the request. Main thread only.
+// own, with the editor's keyboard shortcuts. The window closing, the host
+// dismissing the editor and the host going away all end the request. Main
+// thread only.
 class ExtensionEntry : public QObject {
     Q_OBJECT
   public:
@@ -19,6 +21,7 @@ class ExtensionEntry : public QObject {
     ~ExtensionEntry() override;
 
     platform::Window& window() { return window_; }
+    EditorKeyboard& keyboard() { return *keyboard_; }
     const std::shared_ptr<TXVideoEditorExtensionViewController>& principal() const {
         return principal_;
     }
@@ -41,6 +44,7 @@ class ExtensionEntry : public QObject {
   private:
     std::unique_ptr<platform::ExtensionEndpoint> endpoint_;
     platform::Window window_;
+    EditorKeyboard* keyboard_; // belongs to the window
     std::shared_ptr<TXVideoEditorExtensionContext> context_;
     std::shared_ptr<TXVideoEditorExtensionViewController> principal_;
     bool ended_ = false;

@@ -25,6 +25,8 @@ int main(int argc, char** argv) {
         qputenv("QT_QPA_PLATFORM", "offscreen");
     QApplication app(argc, argv);
     QApplication::setApplicationName(QStringLiteral("tamsel-video-editor"));
+    // The desktop finds the window's entry (name, icon) by this.
+    QGuiApplication::setDesktopFileName(QStringLiteral("org.tamsel.Tamsel"));
     QApplication::setQuitOnLastWindowClosed(false);
     QStringList arguments = app.arguments();
     platform::Device::applyDeviceArgument(arguments);

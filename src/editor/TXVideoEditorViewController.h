@@ -164,6 +164,9 @@ class TXVideoEditorViewController : public platform::ViewController,
 
     // Share sheet (TXVideoEditorViewController_Share.cpp)
     Q_INVOKABLE void shareAction();
+    // Looks up the recorded application's store details, then presents the
+    // activity sheet on the movie at `url`.
+    void displayShareSheetWithVideoURL(const QUrl& url);
 
     // Layout (TXVideoEditorViewController_Layout.cpp)
     void applyPhoneUILayout();

@@ -1,11 +1,14 @@
 #include "FrameworkStrings.h"
 
 #include <array>
+#include <mutex>
 
 std::shared_ptr<platform::Bundle> TXQuillonFrameworkBundle() {
-    // A plain cache: two threads racing on first use both find the same
-    // bundle, which is harmless.
+    // Callers on any thread share the cache, so it is guarded. Not a run-once
+    // guard: a lookup that finds nothing is tried again on the next call.
+    static std::mutex mutex;
     static std::shared_ptr<platform::Bundle> bundle;
+    std::lock_guard lock(mutex);
     if (!bundle)
         bundle = platform::Bundle::bundleForClass(QStringLiteral("PhotoAlbum"));
     return bundle;
@@ -16,10 +19,10 @@ QString TXLocalizedFrameworkString(const QString& key) {
     if (!bundle)
         return key;
     static const std::array<QString, 4> tables = {
-        QStringLiteral("Photos-Desktop"), // this device's own table
-        QStringLiteral("Photos"),
-        QStringLiteral("PhotosSharing"),
-        QStringLiteral("PhotosPublishing"),
+        QStringLiteral("TamselAlbum-Desktop"), // this device's own table
+        QStringLiteral("TamselAlbum"),
+        QStringLiteral("TamselAlbumSharing"),
+        QStringLiteral("TamselAlbumPublishing"),
     };
     QString text = key;
     for (const QString& table : tables) {

@@ -6,7 +6,8 @@
 #include <memory>
 
 // The bundle of the platform's photo framework (the one holding its album
-// class), looked up once and then cached. Null when it is not installed.
+// class), cached once found. Null, and looked up again on the next call,
+// while it is not installed. Callable from any thread.
 std::shared_ptr<platform::Bundle> TXQuillonFrameworkBundle();
 
 // The photo framework's text for `key`, searched in its four tables in order

@@ -1,9 +1,9 @@
 // The photo album on real files: generated movies in, unique names out, and
 // nothing partial or overwritten whatever goes wrong.
 
-#include "platform/services/album/PhotoAlbum.h"
 #include "MediaGenerator.h"
 #include "platform/runtime/GlobalQueue.h"
+#include "platform/services/album/FolderPhotoAlbum.h"
 #include "support/TempDir.h"
 #include "support/Wait.h"
 
@@ -53,7 +53,7 @@ class PhotoAlbumTest : public ::testing::Test {
     static QTemporaryDir* source;
     QTemporaryDir albumRoot;
     QString folder = albumRoot.filePath("Videos/Screen Recordings");
-    PhotoAlbum album{folder};
+    FolderPhotoAlbum album{folder};
 };
 QTemporaryDir* PhotoAlbumTest::source = nullptr;
 
@@ -196,4 +196,14 @@ TEST_F(PhotoAlbumTest, TheEditorsClipsComeInWithoutACopyAndHostFilesAreCopied) {
     ASSERT_EQ(::stat(QFile::encodeName(saved).constData(), &savedInfo), 0);
     EXPECT_NE(savedInfo.st_ino, hostInfo.st_ino);
     EXPECT_EQ(savedInfo.st_nlink, 1u);
+}
+
+TEST_F(PhotoAlbumTest, TheSharedAlbumIsOneAlbumInTheFolderOfItsFirstUse) {
+    testing_support::ScopedEnv env("TAMSEL_ALBUM_DIR", folder.toLocal8Bit());
+    const std::shared_ptr<PhotoAlbum> shared = PhotoAlbum::sharedAlbum();
+    env.set("TAMSEL_ALBUM_DIR", albumRoot.filePath("elsewhere").toLocal8Bit());
+    EXPECT_EQ(PhotoAlbum::sharedAlbum(), shared);
+    PhotoAlbum::sharedAlbum()->saveVideoAtPathToAlbum(movie());
+    GlobalQueue::drain();
+    EXPECT_EQ(entries(folder), QStringList{"clip.mp4"});
 }

@@ -8,6 +8,7 @@
 #include <QFile>
 #include <QJsonDocument>
 #include <QProcess>
+#include <QStandardPaths>
 
 QTemporaryDir* EndToEnd::dir = nullptr;
 
@@ -32,6 +33,33 @@ QByteArray EndToEnd::hashOf(const QString& path) {
     return QCryptographicHash::hash(file.readAll(), QCryptographicHash::Sha256);
 }
 
+namespace {
+
+// "program arguments..." that start tamsel-edit, under xvfb-run when given.
+QStringList command(const QString& xvfbRun, const QSize& screen) {
+    const QString edit = QCoreApplication::applicationDirPath() + "/tamsel-edit";
+    if (xvfbRun.isEmpty())
+        return {edit};
+    return {xvfbRun, "-a", "-s",
+            QString("-screen 0 %1x%2x24").arg(screen.width()).arg(screen.height()), edit};
+}
+
+} // namespace
+
+EndToEnd::Run EndToEnd::editUnderXvfb(const QString& script, const QSize& screen,
+                                      const QStringList& extra, const QProcessEnvironment& env,
+                                      bool* skipped) {
+    const QString xvfbRun = QStandardPaths::findExecutable("xvfb-run");
+    if (skipped)
+        *skipped = xvfbRun.isEmpty();
+    if (xvfbRun.isEmpty())
+        return {};
+    xvfbCommand_ = command(xvfbRun, screen);
+    Run run = edit(script, QString(), extra, env);
+    xvfbCommand_.clear();
+    return run;
+}
+
 EndToEnd::Run EndToEnd::edit(const QString& script, const QString& movie, const QStringList& extra,
                              const QProcessEnvironment& env) {
     const QString scriptPath = mobile.filePath("script.txt");
@@ -45,14 +73,18 @@ EndToEnd::Run EndToEnd::edit(const QString& script, const QString& movie, const 
     environment.insert("TAMSEL_MOBILE_ROOT", mobile.path());
     environment.insert("TAMSEL_ALBUM_DIR", album.path());
     environment.insert("TAMSEL_AUDIO", "null");
-    if (!environment.contains("DISPLAY"))
+    if (!xvfbCommand_.isEmpty())
+        environment.remove("QT_QPA_PLATFORM");
+    else if (!environment.contains("DISPLAY"))
         environment.insert("QT_QPA_PLATFORM", "offscreen");
     for (const QString& key : env.keys())
         environment.insert(key, env.value(key));
     process.setProcessEnvironment(environment);
-    process.start(QCoreApplication::applicationDirPath() + "/tamsel-edit",
-                  QStringList{movie.isEmpty() ? recording() : movie, "--app-name", "Racer",
-                              "--bundle-id", "org.example.Racer", "--automation", scriptPath} +
+    const QStringList program = xvfbCommand_.isEmpty() ? command(QString(), QSize()) : xvfbCommand_;
+    process.start(program.first(),
+                  program.mid(1) +
+                      QStringList{movie.isEmpty() ? recording() : movie, "--app-name", "Racer",
+                                  "--bundle-id", "org.example.Racer", "--automation", scriptPath} +
                       extra);
     if (!process.waitForFinished(180000))
         process.kill();

@@ -3,6 +3,7 @@
 #include <QByteArray>
 #include <QJsonObject>
 #include <QProcessEnvironment>
+#include <QSize>
 #include <QString>
 #include <QStringList>
 #include <QTemporaryDir>
@@ -27,6 +28,11 @@ class EndToEnd : public ::testing::Test {
     Run edit(const QString& script, const QString& movie = QString(), const QStringList& extra = {},
              const QProcessEnvironment& env = {});
 
+    // Runs the same under a fresh X server (xvfb-run) of the given screen
+    // size; `run.exitCode` is -1 and `skipped` set when there is no xvfb-run.
+    Run editUnderXvfb(const QString& script, const QSize& screen, const QStringList& extra = {},
+                      const QProcessEnvironment& env = {}, bool* skipped = nullptr);
+
     QStringList albumFiles() const;
     QStringList tempFiles() const;
     static QString recording() { return dir->filePath("recording.mp4"); }
@@ -35,4 +41,7 @@ class EndToEnd : public ::testing::Test {
     static QTemporaryDir* dir;
     QTemporaryDir mobile;
     QTemporaryDir album;
+
+  private:
+    QStringList xvfbCommand_;
 };

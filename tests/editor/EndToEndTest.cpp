@@ -133,6 +133,64 @@ TEST_F(EndToEnd, ShakeUndoesATrimAndCancelThenReadsDone) {
     EXPECT_EQ(run.hostReport, "[]");
 }
 
+TEST_F(EndToEnd, TheKeyboardAlonePlaysTrimsSavesAndReachesEveryControl) {
+    QString script = R"(
+wait ready
+key Space         # the overlay play button
+wait playing
+key Space         # pause; the chrome comes back
+wait paused
+key Home
+key Shift+Right
+key Shift+Right
+key I
+key Shift+Right
+key Shift+Right
+key Shift+Right
+key O
+dump
+key Ctrl+S
+wait exporting=false 60
+dump
+)";
+    for (int i = 0; i < 12; ++i)
+        script += "key Tab\ndump\n";
+    const Run run = edit(script);
+    ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
+    ASSERT_EQ(run.dumps.size(), 14) << run.out.toStdString();
+
+    const QJsonObject trimming = run.dumps[0];
+    EXPECT_TRUE(trimming["trimming"].toBool());
+    EXPECT_FALSE(trimming["introMode"].toBool());
+    EXPECT_NEAR(trimming["editStartTime"].toDouble(), 2.0, 1e-6);
+    EXPECT_NEAR(trimming["editEndTime"].toDouble(), 5.0, 1e-6);
+
+    const QJsonObject saved = run.dumps[1];
+    EXPECT_FALSE(saved["trimming"].toBool()) << "the player switched to the trimmed clip";
+    EXPECT_TRUE(
+        saved["videoURL"].toString().startsWith("/private/var/mobile/Library/Tamsel//Racer_"));
+    EXPECT_TRUE(names(saved["activityTypes"]).contains("org.tamsel.activity.SaveToAlbum"));
+    ASSERT_EQ(albumFiles().size(), 1);
+    const auto clip =
+        platform::Asset::assetWithURL(QUrl::fromLocalFile(album.filePath(albumFiles().first())));
+    // The trim button's save: from the start handle for the end handle's time.
+    EXPECT_NEAR(clip->duration().seconds(), trimming["editEndTime"].toDouble(), 0.1);
+
+    // Tab goes round the controls the user sees, and only those: the
+    // editor the principal built before its inputs came lies beneath.
+    QSet<QString> reached;
+    for (int i = 2; i < run.dumps.size(); ++i)
+        reached.insert(run.dumps[i]["focus"].toString());
+    QSet<QString> expected{"avTrimmer"};
+    for (const QString& item : names(saved["topToolBar"]))
+        if (!item.endsWith("Space") && item != "titleButton")
+            expected.insert(item);
+    QStringList reachedList = reached.values(), expectedList = expected.values();
+    reachedList.sort();
+    expectedList.sort();
+    EXPECT_EQ(reachedList.join(", ").toStdString(), expectedList.join(", ").toStdString());
+}
+
 TEST_F(EndToEnd, APhoneFollowsTheWindowsShape) {
     const Run run = edit(
         "wait ready\nresize 400 700\nsleep 0.6\ndump\nresize 900 500\nsleep 0.6\ndump\ndismiss\n",

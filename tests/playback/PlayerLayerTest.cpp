@@ -1,6 +1,6 @@
-#include "platform/media/playback/PlayerLayer.h"
 #include "MediaGenerator.h"
 #include "PlaybackFixture.h"
+#include "platform/media/playback/MpvPlayerLayer.h"
 #include "support/Wait.h"
 
 #include <QCoreApplication>
@@ -21,12 +21,12 @@ using testing_support::waitUntil;
 namespace {
 
 // The frame index the layer shows, or -1.
-int shownFrame(PlayerLayer& layer) {
+int shownFrame(MpvPlayerLayer& layer) {
     return testmedia::readFrameIndex(layer.grab().toImage());
 }
 
-std::unique_ptr<PlayerLayer> shownLayer(const std::shared_ptr<Player>& player) {
-    auto layer = std::make_unique<PlayerLayer>();
+std::unique_ptr<MpvPlayerLayer> shownLayer(const std::shared_ptr<Player>& player) {
+    auto layer = std::make_unique<MpvPlayerLayer>();
     layer->setFrame(QRect(0, 0, 320, 240)); // the clips' own size: no bars
     layer->setPlayer(player);
     layer->show();
@@ -124,7 +124,7 @@ TEST(PlaybackPlayerLayer, ShowsTurnedRecordingsUpright) {
         auto item = PlayerItem::playerItemWithURL(
             clipUrl(QStringLiteral("turned%1").arg(degrees), movieSpec));
         auto player = Player::playerWithPlayerItem(item);
-        auto layer = std::make_unique<PlayerLayer>();
+        auto layer = std::make_unique<MpvPlayerLayer>();
         // The coded size turned, so the picture fills the layer.
         layer->setFrame(degrees == 180 ? QRect(0, 0, 320, 240) : QRect(0, 0, 240, 320));
         layer->setPlayer(player);

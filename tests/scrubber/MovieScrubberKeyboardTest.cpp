@@ -65,3 +65,49 @@ TEST_F(ScrubberFixture, AssistiveTechnologySeesASliderAtTheFocusedTime) {
     EXPECT_EQ(client->names(), (QStringList{"beginScrubbing", "value", "endScrubbing"}));
     EXPECT_EQ(value->currentValue().toDouble(), 4.0);
 }
+
+TEST_F(ScrubberFixture, TrimmingAHandleToATimeBeginsEditingAsAPressOnItDoes) {
+    using Handle = platform::MovieScrubberHandle;
+    EXPECT_FALSE(scrubber->trimHandleTo(Handle::Start, 2.0)) << "not editable yet";
+    scrubber->setEditable(true);
+    EXPECT_FALSE(scrubber->trimHandleTo(Handle::Playhead, 2.0));
+    EXPECT_TRUE(client->names().isEmpty());
+
+    // The start is already at 0: editing begins all the same, nothing moves.
+    EXPECT_TRUE(scrubber->trimHandleTo(Handle::Start, 0.0));
+    EXPECT_TRUE(scrubber->isEditing());
+    EXPECT_EQ(client->names(), QStringList{"beginEditing"});
+
+    // Editing has begun; it does not begin again. The end keeps the least
+    // length from the start (1 s by default).
+    EXPECT_TRUE(scrubber->trimHandleTo(Handle::Start, 3.0));
+    EXPECT_TRUE(scrubber->trimHandleTo(Handle::End, 3.5));
+    EXPECT_EQ(client->names(), (QStringList{"beginEditing", "start", "end"}));
+    EXPECT_EQ(client->valuesOf("start"), (std::vector<double>{3.0}));
+    EXPECT_EQ(client->valuesOf("end"), (std::vector<double>{4.0}));
+
+    // In the middle of a pointer gesture the hand has the handles.
+    press(xAt(scrubber->endValue()) + 3);
+    EXPECT_FALSE(scrubber->trimHandleTo(Handle::Start, 1.0));
+    release(xAt(scrubber->endValue()) + 3);
+    EXPECT_DOUBLE_EQ(scrubber->startValue(), 3.0);
+}
+
+TEST_F(ScrubberFixture, StepsOfAPartOutsideTheFocusGoThroughTheSameCalls) {
+    using Handle = platform::MovieScrubberHandle;
+    scrubber->setEditable(true);
+    client->frame = 0.1;
+    scrubber->setValue(1.0);
+    EXPECT_TRUE(scrubber->stepPart(Handle::Playhead, 1, false));
+    EXPECT_TRUE(scrubber->stepPart(Handle::Playhead, -1, true)); // ten frames
+    EXPECT_EQ(scrubber->focusedPart(), Handle::Playhead) << "the focus stays where it was";
+    EXPECT_TRUE(scrubber->stepPart(Handle::End, -1, false));
+    EXPECT_EQ(client->names(),
+              (QStringList{"beginScrubbing", "value", "endScrubbing", "beginScrubbing", "value",
+                           "endScrubbing", "beginEditing", "end"}));
+    const std::vector<double> values = client->valuesOf("value");
+    ASSERT_EQ(values.size(), 2u);
+    EXPECT_NEAR(values[0], 1.1, 1e-9);
+    EXPECT_NEAR(values[1], 0.1, 1e-9);
+    EXPECT_NEAR(client->valuesOf("end").at(0), 9.9, 1e-9);
+}

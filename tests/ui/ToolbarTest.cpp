@@ -111,7 +111,8 @@ TEST(UiToolbar, TitlesAreLocalisedAndEveryButtonIsNamedAndReachable) {
     EXPECT_EQ(b.bar->widgetForItem(play.get())->accessibleName(), QStringLiteral("Wiedergabe"));
     EXPECT_EQ(b.bar->widgetForItem(done.get())->nextInFocusChain(), shareButton);
     EXPECT_EQ(shareButton->nextInFocusChain(), b.bar->widgetForItem(play.get()));
-    EXPECT_EQ(shareButton->focusPolicy(), Qt::StrongFocus);
+    EXPECT_EQ(shareButton->focusPolicy(), Qt::TabFocus)
+        << "a click must not take the focus from where the user's keys go";
 
     shareButton->setFocus();
     ui_input::key(shareButton, Qt::Key_Space);
@@ -134,4 +135,24 @@ TEST(UiToolbar, ItemsTakeTheBarsTintUnlessTheyHaveTheirOwn) {
     b.bar->setItems({save});
     EXPECT_EQ(qobject_cast<ToolbarItemButton*>(b.bar->widgetForItem(save.get()))->effectiveTint(),
               QColor(10, 120, 30));
+}
+
+TEST(UiToolbar, ReplacingTheListKeepsTheKeyboardWhereItWas) {
+    Bar b;
+    auto play = ToolbarItem::systemItem(Item::Play);
+    auto pause = ToolbarItem::systemItem(Item::Pause);
+    auto share = ToolbarItem::systemItem(Item::Action);
+    auto title = ToolbarItem::customViewItem(new Label(QRectF(0, 0, 120, 17)));
+    b.bar->setItems({play, share});
+    b.bar->widgetForItem(play.get())->setFocus();
+
+    b.bar->setItems({pause, share}); // what a press on play does
+    EXPECT_EQ(b.root.focusWidget(), b.bar->widgetForItem(pause.get())) << "the same place";
+    b.bar->setItems({share, pause});
+    EXPECT_EQ(b.root.focusWidget(), b.bar->widgetForItem(pause.get())) << "the same item";
+    b.bar->setItems({share, title});
+    EXPECT_EQ(b.root.focusWidget(), nullptr) << "a title takes no focus; nor does the next item";
+
+    b.bar->setItems({play, share}); // nothing had the focus: nothing takes it
+    EXPECT_EQ(b.root.focusWidget(), nullptr);
 }

@@ -2,6 +2,7 @@
 
 #include "platform/media/MediaTime.h"
 #include "platform/runtime/Error.h"
+#include "platform/runtime/Implementation.h"
 
 #include <QList>
 #include <QSizeF>
@@ -33,44 +34,40 @@ struct AssetTrack {
 // cover art) are not tracks.
 class Asset {
   public:
-    // Opens the URL (device paths are mapped) and reads its headers
-    // synchronously; never null. Something that is not a movie gives an asset
-    // without tracks, with error() set. Callable from any thread.
+    virtual ~Asset() = default;
+
+    // An asset from implementation(): the real one, reading the headers with
+    // FFmpeg, unless a test replaced it. Opens the URL (device paths are
+    // mapped) and reads its headers synchronously; never null. Something that
+    // is not a movie gives an asset without tracks, with error() set.
+    // Callable from any thread.
     static std::shared_ptr<Asset> assetWithURL(const QUrl& url);
+    using Maker = std::shared_ptr<Asset>(const QUrl&);
+    static Implementation<Maker>& implementation();
 
-    ~Asset();
-    Asset(const Asset&) = delete;
-    Asset& operator=(const Asset&) = delete;
-
-    const QUrl& url() const;
+    virtual const QUrl& url() const = 0;
     // The host path the URL maps to (empty for a URL that is not a file).
-    const QString& hostPath() const;
+    virtual const QString& hostPath() const = 0;
     // A path that reads the file the asset opened for as long as the asset
     // lives, even once the file is removed or replaced (the asset keeps it
     // open): what readers of the asset's samples open. The host path when the
     // file could not be kept open (not a regular file).
-    const QString& readablePath() const;
-    QList<AssetTrack> tracks() const;
-    QList<AssetTrack> tracksWithMediaType(MediaType type) const;
+    virtual const QString& readablePath() const { return hostPath(); }
+    virtual QList<AssetTrack> tracks() const = 0;
+    QList<AssetTrack> tracksWithMediaType(MediaType type) const {
+        QList<AssetTrack> matching;
+        for (const AssetTrack& track : tracks())
+            if (track.mediaType == type)
+                matching.append(track);
+        return matching;
+    }
     // The longest track's end, at the first video track's timescale (or the
     // first track's); invalid when there are no tracks.
-    MediaTime duration() const;
+    virtual MediaTime duration() const = 0;
     // True when there is a track whose codec can be decoded here.
-    bool isPlayable() const;
+    virtual bool isPlayable() const = 0;
     // Why the asset has no tracks; null when it opened.
-    ErrorPtr error() const;
-
-  private:
-    Asset() = default;
-
-    QUrl url_;
-    QString hostPath_;
-    QString readablePath_;
-    int descriptor_ = -1;
-    QList<AssetTrack> tracks_;
-    MediaTime duration_;
-    bool playable_ = false;
-    ErrorPtr error_;
+    virtual ErrorPtr error() const = 0;
 };
 
 // The error domain of the media services; codes are FFmpeg's AVERROR values

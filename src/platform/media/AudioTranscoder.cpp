@@ -43,7 +43,7 @@ std::unique_ptr<AudioTranscoder> AudioTranscoder::create(const std::vector<Input
         int err = 0;
         source->decoder = ffmpeg::openDecoder(input.stream, 1, &err);
         if (!source->decoder) {
-            setError(error, mediaFailure(err, QStringLiteral("cannot decode the audio")));
+            setError(error, ffmpeg::failure(err, QStringLiteral("cannot decode the audio")));
             return {};
         }
         const AVChannelLayout& layout = source->decoder->ch_layout;
@@ -53,7 +53,8 @@ std::unique_ptr<AudioTranscoder> AudioTranscoder::create(const std::vector<Input
     }
     const AVCodec* codec = avcodec_find_encoder(AV_CODEC_ID_AAC);
     if (t->sources_.empty() || !codec) {
-        setError(error, mediaFailure(AVERROR_ENCODER_NOT_FOUND, QStringLiteral("no AAC encoder")));
+        setError(error,
+                 ffmpeg::failure(AVERROR_ENCODER_NOT_FOUND, QStringLiteral("no AAC encoder")));
         return {};
     }
     t->encoder_.reset(avcodec_alloc_context3(codec));
@@ -70,7 +71,7 @@ std::unique_ptr<AudioTranscoder> AudioTranscoder::create(const std::vector<Input
     c->flags |= AV_CODEC_FLAG_GLOBAL_HEADER;
     int err = avcodec_open2(c, codec, nullptr);
     if (err < 0) {
-        setError(error, mediaFailure(err, QStringLiteral("cannot open the AAC encoder")));
+        setError(error, ffmpeg::failure(err, QStringLiteral("cannot open the AAC encoder")));
         return {};
     }
     for (auto& source : t->sources_) {
@@ -83,7 +84,7 @@ std::unique_ptr<AudioTranscoder> AudioTranscoder::create(const std::vector<Input
                                        d->sample_fmt, d->sample_rate, 0, nullptr)) < 0 ||
             (err = swr_init(swr)) < 0) {
             swr_free(&swr);
-            setError(error, mediaFailure(err, QStringLiteral("cannot convert the audio")));
+            setError(error, ffmpeg::failure(err, QStringLiteral("cannot convert the audio")));
             return {};
         }
         source->swr.reset(swr);
@@ -92,7 +93,7 @@ std::unique_ptr<AudioTranscoder> AudioTranscoder::create(const std::vector<Input
     AVStream* out = muxer.addStream();
     if (!out || avcodec_parameters_from_context(out->codecpar, c) < 0) {
         setError(error,
-                 mediaFailure(AVERROR(ENOMEM), QStringLiteral("cannot make the audio track")));
+                 ffmpeg::failure(AVERROR(ENOMEM), QStringLiteral("cannot make the audio track")));
         return {};
     }
     out->time_base = c->time_base;
@@ -127,7 +128,7 @@ ErrorPtr AudioTranscoder::take(AVPacket* packet) {
     int err = avcodec_send_packet(source->decoder.get(), packet);
     av_packet_unref(packet);
     if (err < 0 && err != AVERROR(EAGAIN) && err != AVERROR_INVALIDDATA)
-        return mediaFailure(err, QStringLiteral("cannot decode the audio"));
+        return ffmpeg::failure(err, QStringLiteral("cannot decode the audio"));
     while ((err = avcodec_receive_frame(source->decoder.get(), source->frame.get())) >= 0) {
         ErrorPtr e = place(*source, source->frame.get());
         av_frame_unref(source->frame.get());
@@ -135,7 +136,7 @@ ErrorPtr AudioTranscoder::take(AVPacket* packet) {
             return e;
     }
     if (err != AVERROR(EAGAIN) && err != AVERROR_EOF)
-        return mediaFailure(err, QStringLiteral("cannot decode the audio"));
+        return ffmpeg::failure(err, QStringLiteral("cannot decode the audio"));
     return mix(false);
 }
 
@@ -155,12 +156,12 @@ ErrorPtr AudioTranscoder::place(Source& source, AVFrame* frame) {
     converted->nb_samples = int(swr_get_out_samples(source.swr.get(), frame->nb_samples)) + 16;
     av_channel_layout_copy(&converted->ch_layout, &c->ch_layout);
     if (av_frame_get_buffer(converted.get(), 0) < 0)
-        return mediaFailure(AVERROR(ENOMEM), QStringLiteral("cannot convert the audio"));
+        return ffmpeg::failure(AVERROR(ENOMEM), QStringLiteral("cannot convert the audio"));
     const int got =
         swr_convert(source.swr.get(), converted->data, converted->nb_samples,
                     const_cast<const std::uint8_t**>(frame->extended_data), frame->nb_samples);
     if (got < 0)
-        return mediaFailure(got, QStringLiteral("cannot convert the audio"));
+        return ffmpeg::failure(got, QStringLiteral("cannot convert the audio"));
     const std::int64_t next = emitted_ + source.filled();
     std::int64_t skip = 0;
     if (at > next + kJitter) {
@@ -214,7 +215,7 @@ ErrorPtr AudioTranscoder::mix(bool draining) {
         frame->nb_samples = n;
         av_channel_layout_copy(&frame->ch_layout, &c->ch_layout);
         if (av_frame_get_buffer(frame.get(), 0) < 0)
-            return mediaFailure(AVERROR(ENOMEM), QStringLiteral("cannot mix the audio"));
+            return ffmpeg::failure(AVERROR(ENOMEM), QStringLiteral("cannot mix the audio"));
         for (int ch = 0; ch < c->ch_layout.nb_channels; ++ch) {
             float* out = reinterpret_cast<float*>(frame->extended_data[ch]);
             std::fill(out, out + n, 0.0f);
@@ -237,13 +238,13 @@ ErrorPtr AudioTranscoder::mix(bool draining) {
 ErrorPtr AudioTranscoder::encode(AVFrame* frame) {
     int err = avcodec_send_frame(encoder_.get(), frame);
     if (err < 0)
-        return mediaFailure(err, QStringLiteral("cannot encode the audio"));
+        return ffmpeg::failure(err, QStringLiteral("cannot encode the audio"));
     ffmpeg::PacketPtr packet = ffmpeg::makePacket();
     while ((err = avcodec_receive_packet(encoder_.get(), packet.get())) >= 0)
         if ((err = muxer_.write(packet.get(), output_, encoder_->time_base)) < 0)
-            return mediaFailure(err, QStringLiteral("cannot write a sample"));
+            return ffmpeg::failure(err, QStringLiteral("cannot write a sample"));
     if (err != AVERROR(EAGAIN) && err != AVERROR_EOF)
-        return mediaFailure(err, QStringLiteral("cannot encode the audio"));
+        return ffmpeg::failure(err, QStringLiteral("cannot encode the audio"));
     return nullptr;
 }
 

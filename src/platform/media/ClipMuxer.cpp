@@ -8,19 +8,14 @@
 
 namespace platform {
 
-ErrorPtr mediaFailure(int averror, const QString& what) {
-    return makeError(averror, mediaErrorDomain(),
-                     what + QStringLiteral(": ") + ffmpeg::errorText(averror));
-}
-
 std::unique_ptr<ClipMuxer> ClipMuxer::create(const QString& hostPath, ErrorPtr* error) {
     std::unique_ptr<ClipMuxer> muxer(new ClipMuxer);
     muxer->path_ = QFile::encodeName(hostPath);
     AVFormatContext* raw = nullptr;
     const int err = avformat_alloc_output_context2(&raw, nullptr, "mp4", muxer->path_.constData());
     if (err < 0 || !raw) {
-        setError(error, mediaFailure(err < 0 ? err : AVERROR(ENOMEM),
-                                     QStringLiteral("cannot make the output")));
+        setError(error, ffmpeg::failure(err < 0 ? err : AVERROR(ENOMEM),
+                                        QStringLiteral("cannot make the output")));
         return {};
     }
     muxer->output_.reset(raw);
@@ -37,9 +32,9 @@ AVStream* ClipMuxer::addStream() {
 ErrorPtr ClipMuxer::begin() {
     int err = avio_open(&output_->pb, path_.constData(), AVIO_FLAG_WRITE);
     if (err < 0)
-        return mediaFailure(err, QStringLiteral("cannot write the output"));
+        return ffmpeg::failure(err, QStringLiteral("cannot write the output"));
     if ((err = avformat_write_header(output_.get(), nullptr)) < 0)
-        return mediaFailure(err, QStringLiteral("cannot write the output header"));
+        return ffmpeg::failure(err, QStringLiteral("cannot write the output header"));
     return nullptr;
 }
 
@@ -62,7 +57,7 @@ int ClipMuxer::write(AVPacket* packet, AVStream* stream, AVRational timeBase) {
 
 ErrorPtr ClipMuxer::finish() {
     if (const int err = av_write_trailer(output_.get()); err < 0)
-        return mediaFailure(err, QStringLiteral("cannot finish the output"));
+        return ffmpeg::failure(err, QStringLiteral("cannot finish the output"));
     output_.reset();
     return nullptr;
 }

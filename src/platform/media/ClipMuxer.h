@@ -1,5 +1,6 @@
 #pragma once
 
+#include "FFmpegError.h"
 #include "FFmpegHandles.h"
 #include "platform/runtime/Error.h"
 
@@ -40,8 +41,5 @@ class ClipMuxer {
     ffmpeg::OutputPtr output_;
     std::vector<std::int64_t> lastDts_;
 };
-
-// An error of the media domain with FFmpeg's text appended to `what`.
-ErrorPtr mediaFailure(int averror, const QString& what);
 
 } // namespace platform

@@ -33,7 +33,7 @@ ErrorPtr ClipWriter::open() {
     int err = 0;
     input_ = ffmpeg::openInput(job_.sourcePath, &err);
     if (!input_)
-        return mediaFailure(err, QStringLiteral("cannot open the source"));
+        return ffmpeg::failure(err, QStringLiteral("cannot open the source"));
     index_ = SourceIndex::scan(input_.get(), job_.sourcePath);
     // The clip's times count from the movie's first sample, as the player's do.
     const AVFormatContext* in = input_.get();
@@ -100,8 +100,8 @@ ErrorPtr ClipWriter::makeTracks() {
         if (!inMix && keepsLevel && copiesAsItIs(job_.rule, stream->codecpar->codec_id)) {
             auto copier = TrackCopier::create(stream, *muxer_);
             if (!copier)
-                return mediaFailure(AVERROR(ENOMEM),
-                                    QStringLiteral("cannot make the output track"));
+                return ffmpeg::failure(AVERROR(ENOMEM),
+                                       QStringLiteral("cannot make the output track"));
             copier->setCut(route.cut);
             route.copier = copier.get();
             outputs_.emplace_back(copier->output(), int(i));
@@ -158,7 +158,7 @@ ErrorPtr ClipWriter::seek() {
     }
     int err = av_seek_frame(in, seekStream, routes_[seekStream].cut.firstDts, AVSEEK_FLAG_BACKWARD);
     if (err < 0 && (err = avformat_seek_file(in, -1, INT64_MIN, seekFrom, seekFrom, 0)) < 0)
-        return mediaFailure(err, QStringLiteral("cannot seek in the source"));
+        return ffmpeg::failure(err, QStringLiteral("cannot seek in the source"));
     // Without video the clip starts where asked.
     return lead_ < 0 ? settle() : nullptr;
 }
@@ -176,7 +176,7 @@ ErrorPtr ClipWriter::copyRange() {
         if (err == AVERROR_EOF || (err < 0 && in->pb && avio_feof(in->pb)))
             break;
         if (err < 0)
-            return mediaFailure(err, QStringLiteral("cannot read the source"));
+            return ffmpeg::failure(err, QStringLiteral("cannot read the source"));
         // A recording cut short: what lies past its last complete fragment
         // was never completely written.
         if (packet->pos >= 0 && packet->pos + packet->size > index_->completeBytes()) {
@@ -310,7 +310,7 @@ ErrorPtr ClipWriter::dispatch(AVPacket* packet) {
     Route& route = routes_[packet->stream_index];
     if (route.copier) {
         if (const int e = route.copier->take(packet); e < 0)
-            return mediaFailure(e, QStringLiteral("cannot write a sample"));
+            return ffmpeg::failure(e, QStringLiteral("cannot write a sample"));
         return nullptr;
     }
     if (route.video)
@@ -332,7 +332,7 @@ bool ClipWriter::allDone() const {
 ErrorPtr ClipWriter::finish() {
     for (auto& c : copiers_)
         if (const int e = c->finish(); e < 0)
-            return mediaFailure(e, QStringLiteral("cannot write a sample"));
+            return ffmpeg::failure(e, QStringLiteral("cannot write a sample"));
     for (auto& v : videoCoders_)
         if (ErrorPtr e = v->finish())
             return e;

@@ -36,8 +36,11 @@ InputPtr openInputAsIs(const QString& hostPath, int* averror) {
         return {};
     }
     InputPtr input(raw);
-    // MP4 headers carry every codec parameter we need; probing (which
-    // decodes) is only for containers that leave some out.
+    // Probing decodes the start of each stream, so it runs only when the
+    // headers leave out a parameter we read: a video stream's size or pixel
+    // format, an audio stream's sample rate. The MP4 and Matroska demuxers
+    // leave the pixel format unset for H.264 and VP9, so in practice a file
+    // with video is probed, MP4 included; a file with only audio is not.
     bool complete = input->nb_streams > 0;
     for (unsigned i = 0; i < input->nb_streams; ++i) {
         const AVCodecParameters* p = input->streams[i]->codecpar;

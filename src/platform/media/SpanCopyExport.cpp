@@ -6,6 +6,7 @@
 
 #include "CutPlanner.h"
 #include "ExportJob.h"
+#include "FFmpegError.h"
 #include "FFmpegHandles.h"
 #include "Mp4Box.h"
 #include "SourceIndex.h"
@@ -35,10 +36,7 @@ struct SpanTrack {
     bool syncTable = false;      // the source lists its sync samples
 };
 
-ErrorPtr failure(int code, const QString& what) {
-    return makeError(code, mediaErrorDomain(),
-                     what + QStringLiteral(": ") + ffmpeg::errorText(code));
-}
+using ffmpeg::failure;
 
 // The source track box with this track id, or empty.
 QByteArray trackBox(const QByteArray& moov, int trackId) {

@@ -1,6 +1,7 @@
 #include "VideoFrameReader.h"
 
 #include "Asset.h"
+#include "FFmpegError.h"
 #include "FFmpegHandles.h"
 #include "StreamTime.h"
 
@@ -24,10 +25,7 @@ struct VideoFrameReader::State {
 
 namespace {
 
-ErrorPtr mediaError(int averror, const QString& what) {
-    return makeError(averror, mediaErrorDomain(),
-                     what + QStringLiteral(": ") + ffmpeg::errorText(averror));
-}
+using ffmpeg::failure;
 
 QSize fitted(int w, int h, const QSize& box) {
     double scale = 1.0;
@@ -60,13 +58,13 @@ std::unique_ptr<VideoFrameReader> VideoFrameReader::open(const QString& hostPath
     int err = 0;
     state->input = ffmpeg::openInput(hostPath, &err);
     if (!state->input) {
-        setError(error, mediaError(err, QStringLiteral("cannot open the movie")));
+        setError(error, failure(err, QStringLiteral("cannot open the movie")));
         return {};
     }
     const int index =
         av_find_best_stream(state->input.get(), AVMEDIA_TYPE_VIDEO, -1, -1, nullptr, 0);
     if (index < 0) {
-        setError(error, mediaError(index, QStringLiteral("no video track")));
+        setError(error, failure(index, QStringLiteral("no video track")));
         return {};
     }
     // Only the video stream's samples are read; the demuxer skips the rest.
@@ -79,7 +77,7 @@ std::unique_ptr<VideoFrameReader> VideoFrameReader::open(const QString& hostPath
     // frame threads would hold it back until they all have work.
     state->decoder = ffmpeg::openDecoder(state->stream, 1, &err);
     if (!state->decoder) {
-        setError(error, mediaError(err, QStringLiteral("cannot decode the video track")));
+        setError(error, failure(err, QStringLiteral("cannot decode the video track")));
         return {};
     }
     const int entries = avformat_index_get_entries_count(state->stream);
@@ -171,7 +169,7 @@ VideoFrameReader::Frame VideoFrameReader::frameAt(const MediaTime& time, bool ex
         seekTo = startDts - 1;
     }
     if (!haveFrame) {
-        setError(error, mediaError(lastError, QStringLiteral("no frame could be decoded")));
+        setError(error, failure(lastError, QStringLiteral("no frame could be decoded")));
         return {};
     }
 
@@ -182,7 +180,7 @@ VideoFrameReader::Frame VideoFrameReader::frameAt(const MediaTime& time, bool ex
                                       AV_PIX_FMT_BGRA, SWS_AREA, nullptr, nullptr, nullptr));
     QImage image(size, QImage::Format_RGB32);
     if (!d->sws || image.isNull()) {
-        setError(error, mediaError(AVERROR(ENOMEM), QStringLiteral("cannot scale the frame")));
+        setError(error, failure(AVERROR(ENOMEM), QStringLiteral("cannot scale the frame")));
         return {};
     }
     sws_setColorspaceDetails(d->sws.get(), sws_getCoefficients(colorspaceOf(f)),

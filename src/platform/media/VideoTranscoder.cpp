@@ -17,13 +17,13 @@ std::unique_ptr<VideoTranscoder> VideoTranscoder::create(AVStream* source, ClipM
     int err = 0;
     t->decoder_ = ffmpeg::openDecoder(source, 0, &err);
     if (!t->decoder_) {
-        setError(error, mediaFailure(err, QStringLiteral("cannot decode the video")));
+        setError(error, ffmpeg::failure(err, QStringLiteral("cannot decode the video")));
         return {};
     }
     const AVCodec* codec = avcodec_find_encoder_by_name("libx264");
     if (!codec) {
         setError(error,
-                 mediaFailure(AVERROR_ENCODER_NOT_FOUND, QStringLiteral("no H.264 encoder")));
+                 ffmpeg::failure(AVERROR_ENCODER_NOT_FOUND, QStringLiteral("no H.264 encoder")));
         return {};
     }
     t->encoder_.reset(avcodec_alloc_context3(codec));
@@ -46,14 +46,14 @@ std::unique_ptr<VideoTranscoder> VideoTranscoder::create(AVStream* source, ClipM
     av_opt_set(c->priv_data, "preset", settings.x264Preset, 0);
     av_opt_set_double(c->priv_data, "crf", settings.crf, 0);
     if (c->width < 2 || c->height < 2 || (err = avcodec_open2(c, codec, nullptr)) < 0) {
-        setError(error, mediaFailure(err < 0 ? err : AVERROR(EINVAL),
-                                     QStringLiteral("cannot open the H.264 encoder")));
+        setError(error, ffmpeg::failure(err < 0 ? err : AVERROR(EINVAL),
+                                        QStringLiteral("cannot open the H.264 encoder")));
         return {};
     }
     AVStream* out = muxer.addStream();
     if (!out || avcodec_parameters_from_context(out->codecpar, c) < 0) {
         setError(error,
-                 mediaFailure(AVERROR(ENOMEM), QStringLiteral("cannot make the video track")));
+                 ffmpeg::failure(AVERROR(ENOMEM), QStringLiteral("cannot make the video track")));
         return {};
     }
     out->time_base = c->time_base;
@@ -62,8 +62,8 @@ std::unique_ptr<VideoTranscoder> VideoTranscoder::create(AVStream* source, ClipM
     if (const std::uint8_t* m = av_stream_get_side_data(source, AV_PKT_DATA_DISPLAYMATRIX, &size)) {
         std::uint8_t* copy = av_stream_new_side_data(out, AV_PKT_DATA_DISPLAYMATRIX, size);
         if (!copy) {
-            setError(error,
-                     mediaFailure(AVERROR(ENOMEM), QStringLiteral("cannot make the video track")));
+            setError(error, ffmpeg::failure(AVERROR(ENOMEM),
+                                            QStringLiteral("cannot make the video track")));
             return {};
         }
         std::copy(m, m + size, copy);
@@ -86,7 +86,7 @@ ErrorPtr VideoTranscoder::take(AVPacket* packet) {
     av_packet_unref(packet);
     // A damaged packet costs its frame, not the clip.
     if (err < 0 && err != AVERROR(EAGAIN) && err != AVERROR_INVALIDDATA)
-        return mediaFailure(err, QStringLiteral("cannot decode the source"));
+        return ffmpeg::failure(err, QStringLiteral("cannot decode the source"));
     return receiveFrames();
 }
 
@@ -117,10 +117,11 @@ ErrorPtr VideoTranscoder::receiveFrames() {
                 converted_->width = c->width;
                 converted_->height = c->height;
                 if (av_frame_get_buffer(converted_.get(), 0) < 0)
-                    return mediaFailure(AVERROR(ENOMEM), QStringLiteral("cannot convert a frame"));
+                    return ffmpeg::failure(AVERROR(ENOMEM),
+                                           QStringLiteral("cannot convert a frame"));
             }
             if (!sws_ || av_frame_make_writable(converted_.get()) < 0)
-                return mediaFailure(AVERROR(ENOMEM), QStringLiteral("cannot convert a frame"));
+                return ffmpeg::failure(AVERROR(ENOMEM), QStringLiteral("cannot convert a frame"));
             sws_scale(sws_.get(), frame->data, frame->linesize, 0, c->height, converted_->data,
                       converted_->linesize);
             input = converted_.get();
@@ -142,20 +143,20 @@ ErrorPtr VideoTranscoder::receiveFrames() {
             return e;
     }
     if (err < 0 && err != AVERROR(EAGAIN) && err != AVERROR_EOF)
-        return mediaFailure(err, QStringLiteral("cannot decode the source"));
+        return ffmpeg::failure(err, QStringLiteral("cannot decode the source"));
     return nullptr;
 }
 
 ErrorPtr VideoTranscoder::encode(AVFrame* frame) {
     int err = avcodec_send_frame(encoder_.get(), frame);
     if (err < 0)
-        return mediaFailure(err, QStringLiteral("cannot encode"));
+        return ffmpeg::failure(err, QStringLiteral("cannot encode"));
     ffmpeg::PacketPtr packet = ffmpeg::makePacket();
     while ((err = avcodec_receive_packet(encoder_.get(), packet.get())) >= 0)
         if ((err = muxer_.write(packet.get(), output_, encoder_->time_base)) < 0)
-            return mediaFailure(err, QStringLiteral("cannot write a sample"));
+            return ffmpeg::failure(err, QStringLiteral("cannot write a sample"));
     if (err != AVERROR(EAGAIN) && err != AVERROR_EOF)
-        return mediaFailure(err, QStringLiteral("cannot encode"));
+        return ffmpeg::failure(err, QStringLiteral("cannot encode"));
     return nullptr;
 }
 

@@ -13,5 +13,7 @@ inline const QString CopyToPasteboardActivityType =
     QStringLiteral("org.tamsel.activity.CopyToPasteboard");
 inline const QString PostToFacebookActivityType =
     QStringLiteral("org.tamsel.activity.PostToSocialNetwork");
+inline const QString SaveToFilesActivityType = QStringLiteral("org.tamsel.activity.SaveToFiles");
+inline const QString ShowInFolderActivityType = QStringLiteral("org.tamsel.activity.ShowInFolder");
 
 } // namespace platform

@@ -26,6 +26,8 @@ const QHash<QString, QString>& classBundles() {
     static const QHash<QString, QString> table = {
         {QStringLiteral("PhotoAlbum"),
          QStringLiteral("/System/Library/Frameworks/TamselPhotos.framework")},
+        {QStringLiteral("PhotoPublishingActivity"),
+         QStringLiteral("/System/Library/Frameworks/TamselPhotosUI.framework")},
     };
     return table;
 }

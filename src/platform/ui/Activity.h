@@ -4,6 +4,7 @@
 
 #include <QImage>
 #include <QObject>
+#include <QPointer>
 #include <QString>
 #include <QVariantList>
 
@@ -65,7 +66,19 @@ class Activity : public QObject, public std::enable_shared_from_this<Activity> {
     // activity for one more finish.
     void setFinishHandler(std::function<void(bool completed)> handler);
 
+    // The controller the sheet was presented from, set by the sheet before
+    // prepareWithActivityItems, for an activity that opens a window of its
+    // own (a file dialog, say). Held weakly; null outside a sheet.
+    ViewController* presenter() const { return presenter_; }
+    void setPresenter(ViewController* presenter) { presenter_ = presenter; }
+
+  signals:
+    // An activity that learns only later whether it can work here (it asks
+    // another program) says so; the sheet then asks canPerform again.
+    void availabilityChanged();
+
   private:
+    QPointer<ViewController> presenter_;
     std::function<void(bool completed)> onFinish_;
     bool finished_ = false;
 };

@@ -141,6 +141,18 @@ void Button::keyReleaseEvent(QKeyEvent* event) {
     emit clicked(false);
 }
 
+void Button::press() {
+    if (!isEnabled())
+        return;
+    QPointer<Button> self(this);
+    send(ControlEvent::TouchDown);
+    if (!self)
+        return;
+    send(ControlEvent::TouchUpInside);
+    if (self)
+        emit clicked(false);
+}
+
 void Button::focusOutEvent(QFocusEvent* event) {
     if (keyDown_ || tracking_) {
         keyDown_ = tracking_ = false;

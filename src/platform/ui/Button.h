@@ -39,6 +39,10 @@ class Button : public QAbstractButton {
 
     // Handlers run in the order added.
     void addHandler(ControlEvent event, Handler handler);
+    // Presses and releases the button at once, as a click or the space key
+    // does: TouchDown, then TouchUpInside (for keyboard shortcuts). Nothing
+    // happens when it is disabled.
+    void press();
 
     // When false, presses on the button never reach the tap recognisers of
     // its superviews (they do by default).

@@ -53,6 +53,18 @@ void Toolbar::clearWidgets() {
 }
 
 void Toolbar::setItems(const ItemList& items, bool animated) {
+    // The keyboard stays where it was when a press replaces the list (play
+    // becomes pause): on the same item, else on the one in its place.
+    int focusedIndex = -1;
+    std::shared_ptr<ToolbarItem> focusedItem;
+    for (int i = 0; i < widgets_.size(); ++i) {
+        if (widgets_[i] && widgets_[i] == window()->focusWidget()) {
+            focusedIndex = i;
+            focusedItem = items_[i];
+            // Let go first, or hiding it would hand the focus down the chain.
+            widgets_[i]->clearFocus();
+        }
+    }
     clearWidgets();
     items_.clear();
     for (const auto& item : items)
@@ -96,6 +108,13 @@ void Toolbar::setItems(const ItemList& items, bool animated) {
     }
     setNeedsLayout();
     layoutIfNeeded();
+    if (focusedIndex >= 0) {
+        QWidget* next = widgetForItem(focusedItem.get());
+        if (!next && focusedIndex < widgets_.size())
+            next = widgets_[focusedIndex];
+        if (next && (next->focusPolicy() & Qt::TabFocus))
+            next->setFocus(Qt::OtherFocusReason);
+    }
 }
 
 void Toolbar::setDelegate(std::weak_ptr<ToolbarDelegate> delegate) {

@@ -25,7 +25,9 @@ class Toolbar : public View {
 
     ItemList items() const { return items_; }
     // Replaces the list. The widgets of the old list go at once (a custom
-    // view goes back to its item). Animated: the new items fade in.
+    // view goes back to its item). Animated: the new items fade in. When one
+    // of the old widgets had the keyboard focus, the same item's new widget
+    // takes it, else the widget in the same place, if it can.
     void setItems(const ItemList& items, bool animated = false);
 
     std::weak_ptr<ToolbarDelegate> delegate() const { return delegate_; }

@@ -149,6 +149,11 @@ void ToolbarItem::setTintColor(const QColor& colour) {
     emit changed();
 }
 
+void ToolbarItem::setShortcut(const QKeySequence& shortcut) {
+    shortcut_ = shortcut;
+    emit changed();
+}
+
 void ToolbarItem::trigger() {
     if (!enabled_ || !action_)
         return;

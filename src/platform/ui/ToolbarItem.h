@@ -2,6 +2,7 @@
 
 #include <QIcon>
 #include <QImage>
+#include <QKeySequence>
 #include <QMarginsF>
 #include <QObject>
 #include <QPointer>
@@ -75,6 +76,12 @@ class ToolbarItem : public QObject {
     QColor tintColor() const { return tint_; }
     void setTintColor(const QColor& colour);
 
+    // The key that presses this item where it is shown, for display only:
+    // the item's button names it in its tooltip and accessible description.
+    // Whoever binds the key (a ShortcutMap) sets it. Empty: none.
+    QKeySequence shortcut() const { return shortcut_; }
+    void setShortcut(const QKeySequence& shortcut);
+
     void setAction(Action action) { action_ = std::move(action); }
     // Runs the action as a press of the item does.
     void trigger();
@@ -99,6 +106,7 @@ class ToolbarItem : public QObject {
     QMarginsF imageInsets_;
     bool enabled_ = true;
     QColor tint_;
+    QKeySequence shortcut_;
     Action action_;
 };
 

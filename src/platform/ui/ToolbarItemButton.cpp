@@ -3,13 +3,14 @@
 #include "platform/ui/ToolbarItem.h"
 
 #include <QFontMetrics>
+#include <QKeyEvent>
 #include <QPainter>
 
 namespace platform {
 
 ToolbarItemButton::ToolbarItemButton(std::shared_ptr<ToolbarItem> item, QWidget* parent)
     : QAbstractButton(parent), item_(std::move(item)) {
-    setFocusPolicy(Qt::StrongFocus);
+    setFocusPolicy(Qt::TabFocus);
     setCursor(Qt::PointingHandCursor);
     connect(this, &QAbstractButton::clicked, this, [this] { item_->trigger(); });
     connect(item_.get(), &ToolbarItem::changed, this, [this] { refresh(); });
@@ -18,7 +19,14 @@ ToolbarItemButton::ToolbarItemButton(std::shared_ptr<ToolbarItem> item, QWidget*
 
 void ToolbarItemButton::refresh() {
     setAccessibleName(item_->title());
-    setToolTip(item_->showsIcon() ? item_->title() : QString());
+    const QString key = item_->shortcut().toString(QKeySequence::NativeText);
+    if (key.isEmpty()) {
+        setToolTip(item_->showsIcon() ? item_->title() : QString());
+        setAccessibleDescription(QString());
+    } else {
+        setToolTip(tr("%1 (%2)").arg(item_->title(), key));
+        setAccessibleDescription(tr("Shortcut: %1").arg(key));
+    }
     setEnabled(item_->isEnabled());
     QFont f = font();
     f.setBold(item_->isProminent());
@@ -61,13 +69,15 @@ void ToolbarItemButton::paintEvent(QPaintEvent*) {
         QRectF iconRect(0, 0, IconSide, IconSide);
         iconRect.moveCenter(slot.center());
         const qreal ratio = devicePixelRatioF();
-        QPixmap glyph = item_->icon().pixmap(QSize(IconSide, IconSide), ratio);
-        // Icons are templates: their shape, painted in the tint.
+        const QPixmap glyph = item_->icon().pixmap(QSize(IconSide, IconSide), ratio);
+        // Icons are templates: their shape, painted in the tint. The mask is
+        // laid pixel for pixel: drawn by its logical size, a glyph of a
+        // denser screen would cover only part of the tint.
         QImage tinted(glyph.size(), QImage::Format_ARGB32_Premultiplied);
         tinted.fill(tint);
         QPainter mask(&tinted);
         mask.setCompositionMode(QPainter::CompositionMode_DestinationIn);
-        mask.drawPixmap(0, 0, glyph);
+        mask.drawPixmap(QRect(QPoint(0, 0), glyph.size()), glyph);
         mask.end();
         tinted.setDevicePixelRatio(glyph.devicePixelRatio());
         painter.drawImage(iconRect, tinted);
@@ -80,6 +90,21 @@ void ToolbarItemButton::paintEvent(QPaintEvent*) {
         painter.setPen(QPen(ring, 2));
         painter.setBrush(Qt::NoBrush);
         painter.drawRoundedRect(area.adjusted(2, 6, -2, -6), 6, 6);
+    }
+}
+
+void ToolbarItemButton::keyPressEvent(QKeyEvent* event) {
+    switch (event->key()) {
+    case Qt::Key_Left:
+    case Qt::Key_Right:
+    case Qt::Key_Up:
+    case Qt::Key_Down:
+        // A plain button would move the focus; in a bar over a movie the
+        // arrows step through the movie instead.
+        event->ignore();
+        return;
+    default:
+        QAbstractButton::keyPressEvent(event);
     }
 }
 

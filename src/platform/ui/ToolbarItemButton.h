@@ -9,8 +9,12 @@ class ToolbarItem;
 
 // The widget a toolbar makes for a titled, image or system item: the item's
 // icon tinted with the bar's colour (moved by the item's image insets) or its
-// title. Focusable and activated by space or return; its accessible name is
-// the item's title. Made and deleted by Toolbar only.
+// title, drawn at the screen's pixel density. Reached with Tab (a click does
+// not take the focus from where the user's keys go) and activated by space or
+// return; other keys, arrows included, go on to the window's shortcuts. Its
+// accessible name is the item's title; the item's shortcut, when it has one,
+// is named in the tooltip and the accessible description. Made and deleted by
+// Toolbar only.
 class ToolbarItemButton : public QAbstractButton {
     Q_OBJECT
   public:
@@ -25,6 +29,7 @@ class ToolbarItemButton : public QAbstractButton {
 
   protected:
     void paintEvent(QPaintEvent* event) override;
+    void keyPressEvent(QKeyEvent* event) override;
 
   private:
     void refresh();

@@ -260,6 +260,13 @@ void View::sizeToFit() {
     setFrame(f);
 }
 
+bool View::endEditing(bool) {
+    QWidget* editing = window()->focusWidget();
+    if (editing && (editing == this || isAncestorOf(editing)))
+        editing->clearFocus();
+    return true;
+}
+
 bool View::event(QEvent* event) {
     if (event->type() == QEvent::LayoutRequest) {
         layoutIfNeeded();

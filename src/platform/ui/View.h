@@ -93,6 +93,12 @@ class View : public QWidget {
     virtual QSizeF sizeThatFits(const QSizeF& size) const;
     void sizeToFit();
 
+    // Ends text editing in this view's subtree: the field being edited (the
+    // window's focus widget, when it lies here) gives up the focus, which
+    // commits its text. Qt's fields cannot refuse, so `force` changes
+    // nothing. Returns whether no field here is being edited any more.
+    bool endEditing(bool force);
+
     // Helpers for any widget.
     static QRectF frameOf(const QWidget* widget);
     static void setFrameOf(QWidget* widget, const QRectF& frame);

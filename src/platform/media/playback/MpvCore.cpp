@@ -64,7 +64,7 @@ bool MpvCore::start(ErrorPtr* error) {
         {"hr-seek-framedrop", "yes"},
         // libmpv's software renderer aborts the process on rotated video;
         // the player turns the frames upright in the filter chain instead
-        // (see Player::load), the same for every renderer.
+        // (see MpvPlayer::load), the same for every renderer.
         {"video-rotate", "no"},
         // Frames are drawn on the main thread: rendering must never wait
         // for a frame's display time there.

@@ -1,7 +1,7 @@
 #include "OpenGLVideoSurface.h"
 
 #include "MpvCore.h"
-#include "Player.h"
+#include "MpvPlayer.h"
 
 #include <QOpenGLContext>
 
@@ -24,7 +24,7 @@ OpenGLVideoSurface::~OpenGLVideoSurface() {
     detach();
 }
 
-void OpenGLVideoSurface::setPlayer(const std::shared_ptr<Player>& player) {
+void OpenGLVideoSurface::setPlayer(const std::shared_ptr<MpvPlayer>& player) {
     detach();
     player_ = player;
     frameSeen_ = false;
@@ -40,7 +40,7 @@ void OpenGLVideoSurface::initializeGL() {
 }
 
 void OpenGLVideoSurface::attach() {
-    const std::shared_ptr<Player> player = player_.lock();
+    const std::shared_ptr<MpvPlayer> player = player_.lock();
     if (!player || !player->mpvCore() || attachment_ != 0)
         return;
     makeCurrent();

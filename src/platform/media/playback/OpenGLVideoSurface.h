@@ -22,7 +22,7 @@ class OpenGLVideoSurface final : public QOpenGLWidget, public VideoSurface {
 
     Kind kind() const override { return Kind::OpenGL; }
     QWidget* widget() override { return this; }
-    void setPlayer(const std::shared_ptr<Player>& player) override;
+    void setPlayer(const std::shared_ptr<MpvPlayer>& player) override;
     bool hasFrame() const override { return hasFrame_; }
 
   protected:
@@ -34,7 +34,7 @@ class OpenGLVideoSurface final : public QOpenGLWidget, public VideoSurface {
     void detach();
     void onUpdate();
 
-    std::weak_ptr<Player> player_;
+    std::weak_ptr<MpvPlayer> player_;
     std::weak_ptr<MpvCore> core_;
     std::uint64_t attachment_ = 0;
     bool glReady_ = false;

@@ -1,10 +1,7 @@
 #include "PlayerItem.h"
 
-#include "Player.h"
 #include "platform/runtime/Log.h"
 #include "platform/runtime/MainQueue.h"
-
-#include <cmath>
 
 namespace platform {
 
@@ -24,7 +21,7 @@ std::shared_ptr<PlayerItem> PlayerItem::playerItemWithURL(const QUrl& url) {
 std::shared_ptr<PlayerItem> PlayerItem::playerItemWithAsset(std::shared_ptr<Asset> asset) {
     if (!asset)
         asset = Asset::assetWithURL(QUrl());
-    return std::shared_ptr<PlayerItem>(new PlayerItem(std::move(asset)));
+    return implementation().make(std::move(asset));
 }
 
 std::int32_t PlayerItem::timescale() const {
@@ -35,35 +32,6 @@ std::int32_t PlayerItem::timescale() const {
     if (!all.isEmpty() && all.first().naturalTimeScale > 0)
         return all.first().naturalTimeScale;
     return kFallbackTimescale;
-}
-
-MediaTime PlayerItem::duration() const {
-    if (status_ != Status::ReadyToPlay)
-        return MediaTime::invalid();
-    const MediaTime fromHeaders = asset_->duration();
-    if (fromHeaders.isNumeric() && fromHeaders > MediaTime::zero())
-        return fromHeaders;
-    if (std::isfinite(playerDuration_) && playerDuration_ > 0)
-        return MediaTime::fromSeconds(playerDuration_, timescale());
-    return MediaTime::invalid();
-}
-
-MediaTime PlayerItem::currentTime() const {
-    const std::shared_ptr<Player> player = player_.lock();
-    if (!player || player->currentItem().get() != this)
-        return MediaTime::invalid();
-    return player->currentTime();
-}
-
-QList<MediaTimeRange> PlayerItem::loadedTimeRanges() const {
-    if (status_ != Status::ReadyToPlay)
-        return {};
-    if (!loadedRanges_.isEmpty())
-        return loadedRanges_;
-    // libmpv keeps no cache for a local file: all of it can be read at once.
-    if (!asset_->hostPath().isEmpty() && duration().isValid())
-        return {MediaTimeRange::make(MediaTime::make(0, timescale()), duration())};
-    return {};
 }
 
 int PlayerItem::addStatusObserver(StatusObserver observer) {

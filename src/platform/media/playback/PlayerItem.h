@@ -4,6 +4,7 @@
 #include "platform/media/MediaTime.h"
 #include "platform/media/playback/KeyValueObserver.h"
 #include "platform/runtime/Error.h"
+#include "platform/runtime/Implementation.h"
 
 #include <QList>
 #include <QUrl>
@@ -14,8 +15,6 @@
 
 namespace platform {
 
-class Player;
-
 // One movie as a player plays it: its asset, its loading status, what is
 // loaded, and (through the player it is in) its current time.
 //
@@ -23,20 +22,30 @@ class Player;
 // item strongly, the item refers back to that player weakly. An item is in at
 // most one player at a time.
 //
-// Status: Unknown until a player has opened the file; ReadyToPlay once libmpv
-// has opened it and found a video or audio track (a still image alone is not
-// a movie); Failed, with error(), when the URL is not a local file, the file
-// cannot be opened, or it holds nothing to play. A status never goes back to
-// Unknown. Observers hear of every change on the main queue, after the change
-// (never from inside the call that caused it).
+// Status: Unknown until a player has opened the file; ReadyToPlay once the
+// player has opened it and found a video or audio track (a still image alone
+// is not a movie); Failed, with error(), when the URL is not a local file, the
+// file cannot be opened, or it holds nothing to play. A status never goes back
+// to Unknown. Observers hear of every change on the main queue, after the
+// change (never from inside the call that caused it).
+//
+// The status and its observers live here, so every implementation reports
+// them the same way; an implementation changes the status with setStatus().
 class PlayerItem : public std::enable_shared_from_this<PlayerItem> {
   public:
     enum class Status { Unknown = 0, ReadyToPlay = 1, Failed = 2 };
 
+    virtual ~PlayerItem() = default;
+    PlayerItem(const PlayerItem&) = delete;
+    PlayerItem& operator=(const PlayerItem&) = delete;
+
     // Opens the asset on `url` (device paths are mapped) synchronously.
     static std::shared_ptr<PlayerItem> playerItemWithURL(const QUrl& url);
-    // `asset` must not be null.
+    // An item from implementation(): the real one, played by libmpv, unless a
+    // test replaced it. A null `asset` stands for an asset on no URL.
     static std::shared_ptr<PlayerItem> playerItemWithAsset(std::shared_ptr<Asset> asset);
+    using Maker = std::shared_ptr<PlayerItem>(std::shared_ptr<Asset>);
+    static Implementation<Maker>& implementation();
 
     const std::shared_ptr<Asset>& asset() const { return asset_; }
     const QUrl& url() const { return asset_->url(); }
@@ -48,15 +57,15 @@ class PlayerItem : public std::enable_shared_from_this<PlayerItem> {
     // The timescale of the item's times: the first video track's, else the
     // first track's, else 600 (a scale at which common frame rates are whole).
     std::int32_t timescale() const;
-    // Invalid until ReadyToPlay; then the asset's duration, or libmpv's when
-    // the headers gave none.
-    MediaTime duration() const;
+    // Invalid until ReadyToPlay; then the asset's duration, or the player's
+    // when the headers gave none.
+    virtual MediaTime duration() const = 0;
     // The playback position at timescale(). The all-zero invalid time when
     // the item is in no player; zero before the player has reported a time.
-    MediaTime currentTime() const;
+    virtual MediaTime currentTime() const = 0;
     // The spans of the file that are buffered or can be read at once, at
     // timescale(); a local file that is ready is readable whole.
-    QList<MediaTimeRange> loadedTimeRanges() const;
+    virtual QList<MediaTimeRange> loadedTimeRanges() const = 0;
 
     // "status" observation with a callback. Returns a token for removal.
     using StatusObserver = std::function<void(PlayerItem& item)>;
@@ -70,15 +79,16 @@ class PlayerItem : public std::enable_shared_from_this<PlayerItem> {
                                                 int options, void* context);
     void removeObserver_forKeyPath(KeyValueObserver* observer, const QString& keyPath);
 
-  private:
-    friend class Player;
+  protected:
+    // `asset` must not be null.
     explicit PlayerItem(std::shared_ptr<Asset> asset);
 
-    // Called by the player that plays the item.
+    // Main thread. Changes the status (Unknown and the status it already has
+    // are ignored) and tells every observer, each on a turn of the main queue
+    // of its own. `error` is kept only with Failed.
     void setStatus(Status status, ErrorPtr error = nullptr);
-    void setLoadedTimeRanges(QList<MediaTimeRange> ranges) { loadedRanges_ = std::move(ranges); }
-    void setDurationSeconds(double seconds) { playerDuration_ = seconds; }
 
+  private:
     struct Observer {
         int token;
         StatusObserver callback;
@@ -91,9 +101,6 @@ class PlayerItem : public std::enable_shared_from_this<PlayerItem> {
     std::shared_ptr<Asset> asset_;
     Status status_ = Status::Unknown;
     ErrorPtr error_;
-    QList<MediaTimeRange> loadedRanges_;
-    double playerDuration_ = 0;
-    std::weak_ptr<Player> player_;
     QList<Observer> observers_;
     int nextToken_ = 1;
 };

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "platform/media/playback/Player.h"
+#include "platform/runtime/Implementation.h"
 
 #include <QWidget>
 
@@ -8,11 +9,8 @@
 
 namespace platform {
 
-class VideoSurface;
-
 // A widget that shows a player's video, scaled to fit with its aspect kept
-// (black bars elsewhere). Drawn with OpenGL when the display has it and with
-// libmpv's software renderer otherwise (see VideoSurface::preferredKind).
+// (black bars elsewhere).
 //
 // Threads: main thread only. Ownership: a QWidget owned by its Qt parent; it
 // holds its player strongly. A player is shown by one layer at a time: the
@@ -20,32 +18,25 @@ class VideoSurface;
 // picture. Without a layer the player still plays (see Player).
 class PlayerLayer : public QWidget {
   public:
-    explicit PlayerLayer(QWidget* parent = nullptr);
-    ~PlayerLayer() override;
-
+    // A layer from implementation(): the real one, drawing what libmpv
+    // decodes, unless a test replaced it.
     static PlayerLayer* playerLayerWithPlayer(std::shared_ptr<Player> player,
                                               QWidget* parent = nullptr);
+    using Maker = PlayerLayer*(QWidget* parent);
+    static Implementation<Maker>& implementation();
 
-    const std::shared_ptr<Player>& player() const { return player_; }
-    void setPlayer(std::shared_ptr<Player> player);
+    virtual const std::shared_ptr<Player>& player() const = 0;
+    virtual void setPlayer(std::shared_ptr<Player> player) = 0;
 
     // The layer's rectangle in its parent's coordinates.
     QRect frame() const { return geometry(); }
     void setFrame(const QRect& frame) { setGeometry(frame); }
 
     // True once a frame of the current player's video has been drawn.
-    bool isReadyForDisplay() const;
-    // Whether the video is drawn with OpenGL (false: software).
-    bool usesOpenGL() const;
+    virtual bool isReadyForDisplay() const = 0;
 
   protected:
-    void resizeEvent(QResizeEvent* event) override;
-
-  private:
-    void makeSurface(int kind);
-
-    std::shared_ptr<Player> player_;
-    std::unique_ptr<VideoSurface> surface_;
+    explicit PlayerLayer(QWidget* parent) : QWidget(parent) {}
 };
 
 } // namespace platform

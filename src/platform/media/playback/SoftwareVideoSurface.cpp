@@ -1,7 +1,7 @@
 #include "SoftwareVideoSurface.h"
 
 #include "MpvCore.h"
-#include "Player.h"
+#include "MpvPlayer.h"
 
 #include <QPainter>
 
@@ -22,7 +22,7 @@ void SoftwareVideoSurface::detach() {
     attachment_ = 0;
 }
 
-void SoftwareVideoSurface::setPlayer(const std::shared_ptr<Player>& player) {
+void SoftwareVideoSurface::setPlayer(const std::shared_ptr<MpvPlayer>& player) {
     detach();
     hasFrame_ = false;
     frameSeen_ = false;

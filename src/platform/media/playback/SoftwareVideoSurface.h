@@ -23,7 +23,7 @@ class SoftwareVideoSurface final : public QWidget, public VideoSurface {
 
     Kind kind() const override { return Kind::Software; }
     QWidget* widget() override { return this; }
-    void setPlayer(const std::shared_ptr<Player>& player) override;
+    void setPlayer(const std::shared_ptr<MpvPlayer>& player) override;
     bool hasFrame() const override { return hasFrame_; }
 
   protected:

@@ -7,7 +7,7 @@ class QWidget;
 
 namespace platform {
 
-class Player;
+class MpvPlayer;
 
 // What draws a player's video inside a PlayerLayer: libmpv's OpenGL renderer
 // in a GL widget, or its software renderer into an image painted with
@@ -32,7 +32,7 @@ class VideoSurface {
     virtual QWidget* widget() = 0;
     // Takes over the player's video (null: lets it go). The surface holds the
     // player only weakly; the layer holds it strongly.
-    virtual void setPlayer(const std::shared_ptr<Player>& player) = 0;
+    virtual void setPlayer(const std::shared_ptr<MpvPlayer>& player) = 0;
     // True once a frame of the current player has been drawn.
     virtual bool hasFrame() const = 0;
 

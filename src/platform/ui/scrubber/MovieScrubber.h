@@ -124,6 +124,22 @@ class MovieScrubber : public QWidget {
     // bounds and delegate calls; for assistive technology. Returns whether it
     // moved.
     bool moveFocusedPartTo(double seconds);
+    // Moves `part` to `seconds` as the keyboard does: the playhead in one
+    // whole scrub (begin, value, end), a handle within its bounds, entering
+    // editing first. Nothing happens, and false comes back, when the part
+    // would not move, there is no movie or a pointer gesture is under way.
+    bool movePartTo(Handle part, double seconds);
+    // Steps `part` by one frame (`large`: ten frames or a second, whichever
+    // is longer) backwards (`direction` < 0) or forwards, as the arrow keys
+    // do. Returns whether it moved.
+    bool stepPart(Handle part, int direction, bool large);
+    // Sets the start or end handle as pressing and dragging it does: editing
+    // begins when it has not (the delegate hears movieScrubberDidBeginEditing
+    // even if the handle then stays where it is), then the handle moves to
+    // `seconds` within its bounds (the delegate hears the new value). False
+    // when the scrubber is not editable, has no movie, or a pointer gesture is
+    // under way.
+    bool trimHandleTo(Handle handle, double seconds);
 
     QSize sizeHint() const override;
     QSize minimumSizeHint() const override;
@@ -172,7 +188,7 @@ class MovieScrubber : public QWidget {
     // Keyboard (MovieScrubber_Keys.cpp)
     QList<Handle> focusableParts() const;
     double effectiveFrameDuration();
-    double focusedPartTime() const;
+    double partTime(Handle part) const;
 
     // Painting (MovieScrubber_Paint.cpp)
     void paintThumbnails(QPainter& painter, const QRectF& track, const TimelineMapping& map) const;

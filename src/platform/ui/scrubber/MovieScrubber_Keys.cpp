@@ -40,8 +40,8 @@ double MovieScrubber::effectiveFrameDuration() {
     return kFallbackFrameDuration;
 }
 
-double MovieScrubber::focusedPartTime() const {
-    switch (focusPart_) {
+double MovieScrubber::partTime(Handle part) const {
+    switch (part) {
     case Handle::Start:
         return range_.start();
     case Handle::End:
@@ -53,9 +53,13 @@ double MovieScrubber::focusedPartTime() const {
 }
 
 bool MovieScrubber::moveFocusedPartTo(double seconds) {
+    return movePartTo(focusPart_, seconds);
+}
+
+bool MovieScrubber::movePartTo(Handle part, double seconds) {
     if (!timeline_.hasMovie() || gesture_ != Gesture::None || !std::isfinite(seconds))
         return false;
-    if (focusPart_ == Handle::Playhead) {
+    if (part == Handle::Playhead) {
         const double target = clampPlayhead(seconds);
         if (target == value_)
             return false;
@@ -70,13 +74,33 @@ bool MovieScrubber::moveFocusedPartTo(double seconds) {
     }
     if (!editable_)
         return false;
-    const bool start = focusPart_ == Handle::Start;
+    const bool start = part == Handle::Start;
     const double target = start ? range_.clampStart(seconds) : range_.clampEnd(seconds);
     if (target == (start ? range_.start() : range_.end()))
         return false;
     if (!editing_ && !enterEditingByUser())
         return false;
-    userSetHandle(focusPart_, target);
+    userSetHandle(part, target);
+    return true;
+}
+
+bool MovieScrubber::stepPart(Handle part, int direction, bool large) {
+    if (!timeline_.hasMovie() || direction == 0)
+        return false;
+    const double frame = effectiveFrameDuration();
+    const int frames = large ? std::max(10, static_cast<int>(std::lround(1.0 / frame))) : 1;
+    return movePartTo(part, stepFrames(partTime(part), frame, direction < 0 ? -frames : frames));
+}
+
+bool MovieScrubber::trimHandleTo(Handle handle, double seconds) {
+    if (handle == Handle::Playhead || !editable_ || !timeline_.hasMovie() ||
+        gesture_ != Gesture::None || !std::isfinite(seconds))
+        return false;
+    // As a press on the handle: editing begins before anything moves.
+    if (!editing_ && !enterEditingByUser())
+        return false;
+    userSetHandle(handle,
+                  handle == Handle::Start ? range_.clampStart(seconds) : range_.clampEnd(seconds));
     return true;
 }
 
@@ -85,17 +109,14 @@ void MovieScrubber::keyPressEvent(QKeyEvent* event) {
         QWidget::keyPressEvent(event);
         return;
     }
-    const double frame = effectiveFrameDuration();
     const bool large = event->modifiers().testFlag(Qt::ShiftModifier);
-    const int frames = large ? std::max(10, static_cast<int>(std::lround(1.0 / frame))) : 1;
-    const double now = focusedPartTime();
 
     switch (event->key()) {
     case Qt::Key_Left:
-        moveFocusedPartTo(stepFrames(now, frame, -frames));
+        stepPart(focusPart_, -1, large);
         break;
     case Qt::Key_Right:
-        moveFocusedPartTo(stepFrames(now, frame, frames));
+        stepPart(focusPart_, 1, large);
         break;
     case Qt::Key_Home:
         moveFocusedPartTo(0.0);

@@ -1,0 +1,40 @@
+#pragma once
+
+#include "platform/services/album/PhotoAlbum.h"
+
+namespace platform {
+
+// The album as a folder: the user's "Screen Recordings" folder in their
+// Videos (XDG videos dir), or $TAMSEL_ALBUM_DIR. A video is brought in under a
+// unique name, never replacing a file that is there and never showing a
+// partial one: without copying its bytes where the file system allows (a
+// reflink; else, for a file of the device's own storage such as the editor's
+// clips, a hard link), otherwise copied under a hidden temporary name first
+// and named when whole. Files that are not playable video are refused.
+class FolderPhotoAlbum final : public PhotoAlbum {
+  public:
+    // The album in the user's Videos.
+    static std::shared_ptr<FolderPhotoAlbum> inUsersVideos();
+    // An album in the given host folder.
+    explicit FolderPhotoAlbum(QString folderHostPath);
+
+    const QString& folder() const { return folder_; }
+
+    // On success the new file's host path is available through
+    // lastSavedPath().
+    void performChanges_creationRequestForAssetFromVideoAtFileURL(const QUrl& fileURL,
+                                                                  Completion completion) override;
+    void saveVideoAtPathToAlbum(const QString& path) override;
+
+    // Copies synchronously on the caller's thread; what both operations run.
+    // Returns the host path of the new file, or an empty string and `error`.
+    QString importVideo(const QString& devicePath, ErrorPtr* error);
+
+    QString lastSavedPath() const;
+
+  private:
+    QString folder_;
+    mutable std::shared_ptr<QString> lastSaved_ = std::make_shared<QString>();
+};
+
+} // namespace platform

@@ -1,0 +1,219 @@
+// How the editor looks: screenshots of the real window under Xvfb, taken by
+// the automation, compared where the drawing should agree.
+
+#include "EndToEndFixture.h"
+
+#include <QCoreApplication>
+#include <QDir>
+#include <QImage>
+#include <QJsonArray>
+#include <QRegion>
+
+namespace {
+
+QRect frameOf(const QJsonObject& dump, const QString& name) {
+    const QJsonArray f = dump["frames"].toObject()[name].toArray();
+    if (f.size() != 4)
+        return {};
+    return QRect(f[0].toInt(), f[1].toInt(), f[2].toInt(), f[3].toInt());
+}
+
+// Where the screenshots go, for a person to look at.
+QString shotPath(const QString& name) {
+    const QString dir = QCoreApplication::applicationDirPath() + "/../screenshots";
+    QDir().mkpath(dir);
+    return QDir(dir).filePath(name);
+}
+
+// The largest difference of a colour channel between the two pictures over
+// `where` (device-independent pixels at `scale` pixels each).
+int largestDifference(const QImage& a, const QImage& b, const QRegion& where, qreal scale = 1) {
+    int largest = 0;
+    for (const QRect& r : where) {
+        const QRect pixels(QPoint(qRound(r.left() * scale), qRound(r.top() * scale)),
+                           QSize(qRound(r.width() * scale), qRound(r.height() * scale)));
+        for (int y = pixels.top(); y <= pixels.bottom(); ++y)
+            for (int x = pixels.left(); x <= pixels.right(); ++x) {
+                const QRgb p = a.pixel(x, y), q = b.pixel(x, y);
+                largest =
+                    std::max({largest, std::abs(qRed(p) - qRed(q)), std::abs(qGreen(p) - qGreen(q)),
+                              std::abs(qBlue(p) - qBlue(q))});
+            }
+    }
+    return largest;
+}
+
+} // namespace
+
+namespace {
+
+// Intro and edit mode, shot with the same frame under the bars (they are
+// translucent over the movie): the playhead at the same place in both.
+const char* kIntroThenEdit = R"(
+wait ready
+wait frame
+drag playhead 2
+sleep 0.8
+dump
+screenshot %1
+drag end 6
+drag playhead 2
+sleep 0.8
+dump
+screenshot %2
+)";
+
+// The bar drawn in both shots agrees outside the items of either list, and
+// each pair of items (before, after) looks the same wherever it stands.
+void expectBarsAgree(const QImage& a, const QImage& b, const QJsonObject& before,
+                     const QJsonObject& after, const QString& bar,
+                     const QList<std::pair<QString, QString>>& sameItems) {
+    const QRect frame = frameOf(before, bar);
+    ASSERT_FALSE(frame.isEmpty()) << bar.toStdString();
+    ASSERT_EQ(frame, frameOf(after, bar));
+    QRegion background(frame);
+    for (const QJsonObject* dump : {&before, &after})
+        for (const QJsonValue& item : dump->value(bar).toArray())
+            background -= frameOf(*dump, item.toString()).adjusted(-2, -2, 2, 2);
+    EXPECT_LE(largestDifference(a, b, background), 4) << bar.toStdString();
+    for (const auto& [was, is] : sameItems) {
+        const QRect from = frameOf(before, was), to = frameOf(after, is);
+        ASSERT_FALSE(from.isEmpty() || to.isEmpty()) << was.toStdString();
+        ASSERT_EQ(from.size(), to.size()) << was.toStdString();
+        EXPECT_EQ(a.copy(from), b.copy(to)) << was.toStdString() << " and " << is.toStdString();
+    }
+}
+
+} // namespace
+
+TEST_F(EndToEnd, TheWideEditModeToolbarDrawsAsTheIntroOneWhereTheyAgree) {
+    const QString intro = shotPath("wide-intro.png"), editing = shotPath("wide-edit.png");
+    bool skipped = false;
+    const Run run = editUnderXvfb(QString(kIntroThenEdit).arg(intro, editing), QSize(1280, 800), {},
+                                  {}, &skipped);
+    if (skipped)
+        GTEST_SKIP() << "xvfb-run is not installed";
+    ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
+    ASSERT_EQ(run.dumps.size(), 2);
+    const QJsonObject &before = run.dumps[0], &after = run.dumps[1];
+    ASSERT_TRUE(after["trimming"].toBool() && after["padMode"].toBool());
+    ASSERT_EQ(before["currentTime"].toDouble(), after["currentTime"].toDouble());
+    const QImage a(intro), b(editing);
+    ASSERT_FALSE(a.isNull() || b.isNull());
+    expectBarsAgree(a, b, before, after, "topToolBar",
+                    {{"cancelButton", "cancelTrimButton"},
+                     {"titleButton", "titleButton"},
+                     {"playButton", "playButton"}});
+}
+
+TEST_F(EndToEnd, TheCompactEditModeToolbarsDrawAsTheIntroOnesWhereTheyAgree) {
+    const QString intro = shotPath("compact-intro.png"), editing = shotPath("compact-edit.png");
+    bool skipped = false;
+    const Run run =
+        editUnderXvfb("resize 480 800\nsleep 0.5\n" + QString(kIntroThenEdit).arg(intro, editing),
+                      QSize(1280, 1024), {"--device", "phone"}, {}, &skipped);
+    if (skipped)
+        GTEST_SKIP() << "xvfb-run is not installed";
+    ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
+    ASSERT_EQ(run.dumps.size(), 2);
+    const QJsonObject &before = run.dumps[0], &after = run.dumps[1];
+    ASSERT_TRUE(after["trimming"].toBool());
+    ASSERT_FALSE(after["padMode"].toBool()) << "a phone held upright has the compact layout";
+    ASSERT_EQ(before["currentTime"].toDouble(), after["currentTime"].toDouble());
+    const QImage a(intro), b(editing);
+    ASSERT_FALSE(a.isNull() || b.isNull());
+    expectBarsAgree(a, b, before, after, "topToolBar",
+                    {{"cancelButton", "cancelTrimButton"}, {"titleButton", "titleButton"}});
+    expectBarsAgree(a, b, before, after, "bottomToolBar",
+                    {{"shareButton", "shareButton"}, {"playButton", "playButton"}});
+}
+
+namespace {
+
+// Halves a picture, each pixel the mean of four.
+QImage halved(const QImage& image) {
+    const QImage in = image.convertToFormat(QImage::Format_RGB32);
+    QImage out(in.width() / 2, in.height() / 2, QImage::Format_RGB32);
+    for (int y = 0; y < out.height(); ++y)
+        for (int x = 0; x < out.width(); ++x) {
+            int r = 0, g = 0, b = 0;
+            for (int dy = 0; dy < 2; ++dy)
+                for (int dx = 0; dx < 2; ++dx) {
+                    const QRgb p = in.pixel(2 * x + dx, 2 * y + dy);
+                    r += qRed(p), g += qGreen(p), b += qBlue(p);
+                }
+            out.setPixel(x, y, qRgb((r + 2) / 4, (g + 2) / 4, (b + 2) / 4));
+        }
+    return out;
+}
+
+// The mean difference of the colour channels, 0..255.
+double meanDifference(const QImage& a, const QImage& b) {
+    const QImage p = a.convertToFormat(QImage::Format_RGB32),
+                 q = b.convertToFormat(QImage::Format_RGB32);
+    if (p.size() != q.size() || p.isNull())
+        return 255;
+    double sum = 0;
+    for (int y = 0; y < p.height(); ++y)
+        for (int x = 0; x < p.width(); ++x) {
+            const QRgb u = p.pixel(x, y), v = q.pixel(x, y);
+            sum += std::abs(qRed(u) - qRed(v)) + std::abs(qGreen(u) - qGreen(v)) +
+                   std::abs(qBlue(u) - qBlue(v));
+        }
+    return sum / (3.0 * p.width() * p.height());
+}
+
+} // namespace
+
+TEST_F(EndToEnd, AtTwiceTheDensityGlyphsMasksAndThumbnailsAreDrawnSharp) {
+    const QString script = "wait ready\nwait frame\nsleep 0.8\ndump\nscreenshot %1\n";
+    QImage shots[2];
+    QJsonObject dumps[2];
+    for (int i = 0; i < 2; ++i) {
+        const int scale = i + 1;
+        const QString path = shotPath(QString("editor-scale%1.png").arg(scale));
+        QProcessEnvironment env;
+        env.insert("QT_SCALE_FACTOR", QString::number(scale));
+        bool skipped = false;
+        const Run run =
+            editUnderXvfb(script.arg(path), QSize(1280, 800) * scale, {}, env, &skipped);
+        if (skipped)
+            GTEST_SKIP() << "xvfb-run is not installed";
+        ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
+        ASSERT_EQ(run.dumps.size(), 1);
+        dumps[i] = run.dumps[0];
+        shots[i] = QImage(path).convertToFormat(QImage::Format_RGB32);
+        ASSERT_FALSE(shots[i].isNull());
+    }
+    ASSERT_EQ(shots[1].size(), shots[0].size() * 2) << "every point is two pixels a side";
+
+    // Each part at scale 2 must look like itself at scale 1 (the same
+    // shapes in the same places: `agree` is the mean channel difference of
+    // the halved picture; text and thumbnails are resampled, so they are
+    // allowed more), and carry detail that the scale 1 picture blown up does
+    // not: it is as far from the blocky and the smooth blow-up as they are
+    // from each other, at least by half.
+    const struct {
+        const char* name;
+        double agree;
+    } parts[] = {{"shareButton", 3},
+                 {"saveButton", 3},
+                 {"videoOverlayPlayButton", 3},
+                 {"titleButton", 10},
+                 {"avTrimmer", 6}};
+    for (const auto& part : parts) {
+        SCOPED_TRACE(part.name);
+        const QRect logical = frameOf(dumps[0], part.name);
+        ASSERT_FALSE(logical.isEmpty());
+        ASSERT_EQ(frameOf(dumps[1], part.name), logical);
+        const QImage one = shots[0].copy(logical);
+        const QImage two = shots[1].copy(QRect(logical.topLeft() * 2, logical.size() * 2));
+        EXPECT_LE(meanDifference(halved(two), one), part.agree);
+        const QImage blocky = one.scaled(two.size(), Qt::IgnoreAspectRatio, Qt::FastTransformation);
+        const QImage smooth =
+            one.scaled(two.size(), Qt::IgnoreAspectRatio, Qt::SmoothTransformation);
+        const double blowUps = meanDifference(blocky, smooth);
+        EXPECT_GE(meanDifference(two, blocky), blowUps / 2);
+        EXPECT_GE(meanDifference(two, smooth), blowUps / 2);
+    }
+}

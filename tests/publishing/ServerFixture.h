@@ -1,0 +1,37 @@
+#pragma once
+
+#include "FakeBrowser.h"
+#include "FakeYouTubeServer.h"
+#include "support/TempDir.h"
+
+#include "platform/publishing/YouTubeSignIn.h"
+
+#include <QTemporaryDir>
+#include <gtest/gtest.h>
+
+#include <memory>
+
+namespace testing_support {
+
+// A started fake of the service with the plug-in pointed at it, and no
+// secret store: the session bus points nowhere, so nothing a test does
+// reaches the keyring of the user running it, and the account lives in
+// memory. Each test starts signed out.
+class ServerFixture : public ::testing::Test {
+  protected:
+    ServerFixture();
+    void SetUp() override;
+    void TearDown() override;
+
+    // A sign-in of the plug-in (the real one).
+    std::shared_ptr<platform::YouTubeSignIn> makeSignIn();
+    // Signs in without the browser: the account's refresh token is one the
+    // server knows.
+    void signInQuietly();
+
+    QTemporaryDir storage_;
+    FakeYouTubeServer server_;
+    ScopedEnv env_;
+};
+
+} // namespace testing_support

@@ -1,0 +1,153 @@
+// The D-Bus ways out: the portal's Email interface (used inside a sandbox)
+// and the file manager's ShowItems, against fakes of those services on a
+// private session bus.
+
+#include "PrivateSessionBus.h"
+#include "platform/ui/share/DBusFileManager.h"
+#include "platform/ui/share/PortalMailComposer.h"
+#include "support/Wait.h"
+
+#include <QDBusArgument>
+#include <QDBusConnectionInterface>
+#include <QDBusMessage>
+#include <QDBusMetaType>
+#include <QDBusObjectPath>
+#include <QDBusUnixFileDescriptor>
+#include <QFile>
+#include <QTemporaryDir>
+#include <QTimer>
+#include <gtest/gtest.h>
+#include <unistd.h>
+
+using namespace platform;
+using testing_support::waitUntil;
+
+namespace {
+
+// org.freedesktop.portal.Email as a desktop portal serves it: the call
+// returns the request's path, and the answer comes as that request's
+// Response signal. Reads the attachments through the descriptors it gets.
+class FakeEmailPortal : public QObject {
+    Q_OBJECT
+    Q_CLASSINFO("D-Bus Interface", "org.freedesktop.portal.Email")
+    Q_PROPERTY(uint version READ version)
+  public:
+    explicit FakeEmailPortal(QDBusConnection bus) : bus_(std::move(bus)) {}
+    uint version() const { return 3; }
+    uint answer = 0;
+    QVariantMap options;
+    QList<QByteArray> attachments;
+
+  public slots:
+    QDBusObjectPath ComposeEmail(const QString&, const QVariantMap& received,
+                                 const QDBusMessage& message) {
+        options = received;
+        QList<QDBusUnixFileDescriptor> fds;
+        received.value("attachment_fds").value<QDBusArgument>() >> fds;
+        for (const QDBusUnixFileDescriptor& fd : fds) {
+            QFile file;
+            file.open(::dup(fd.fileDescriptor()), QIODevice::ReadOnly, QFile::AutoCloseHandle);
+            attachments.append(file.readAll());
+        }
+        QString sender = message.service().mid(1).replace('.', '_');
+        const QString path = "/org/freedesktop/portal/desktop/request/" + sender + "/" +
+                             received.value("handle_token").toString();
+        QTimer::singleShot(10, this, [this, path] {
+            QDBusMessage response =
+                QDBusMessage::createSignal(path, "org.freedesktop.portal.Request", "Response");
+            response << answer << QVariantMap();
+            bus_.send(response);
+        });
+        return QDBusObjectPath(path);
+    }
+
+  private:
+    QDBusConnection bus_;
+};
+
+class FakeFileManager1 : public QObject {
+    Q_OBJECT
+    Q_CLASSINFO("D-Bus Interface", "org.freedesktop.FileManager1")
+  public:
+    QStringList shown;
+  public slots:
+    void ShowItems(const QStringList& uris, const QString&) { shown += uris; }
+};
+
+class DesktopServicesTest : public ::testing::Test {
+  protected:
+    void SetUp() override {
+        if (!bus.isRunning())
+            GTEST_SKIP() << "dbus-daemon is not installed";
+        qDBusRegisterMetaType<QList<QDBusUnixFileDescriptor>>();
+    }
+    testing_support::PrivateSessionBus bus;
+};
+
+} // namespace
+
+TEST_F(DesktopServicesTest, ThePortalGetsTheBodyAndTheAttachmentsAsDescriptors) {
+    QDBusConnection service = bus.connect("portal-service");
+    QDBusConnection client = bus.connect("portal-client");
+    PortalMailComposer composer(client);
+
+    std::optional<bool> available;
+    composer.checkAvailability([&](bool a) { available = a; });
+    ASSERT_TRUE(waitUntil([&] { return available.has_value(); }));
+    EXPECT_FALSE(*available) << "no portal on the bus yet";
+
+    FakeEmailPortal portal(service);
+    ASSERT_TRUE(service.registerObject("/org/freedesktop/portal/desktop", &portal,
+                                       QDBusConnection::ExportAllSlots |
+                                           QDBusConnection::ExportAllProperties));
+    ASSERT_TRUE(service.registerService("org.freedesktop.portal.Desktop"));
+    available.reset();
+    composer.checkAvailability([&](bool a) { available = a; });
+    ASSERT_TRUE(waitUntil([&] { return available.has_value(); }));
+    EXPECT_TRUE(*available);
+
+    QTemporaryDir dir;
+    QFile movie(dir.filePath("clip.mp4"));
+    ASSERT_TRUE(movie.open(QIODevice::WriteOnly));
+    movie.write("not really a movie");
+    movie.close();
+    MailDraft draft;
+    draft.body = "Check out my recording of Racer by Example Games!";
+    draft.attachments = {QUrl::fromLocalFile(movie.fileName())};
+    std::optional<bool> handedOver;
+    composer.compose(draft, [&](bool ok) { handedOver = ok; });
+    ASSERT_TRUE(waitUntil([&] { return handedOver.has_value(); }));
+    EXPECT_TRUE(*handedOver);
+    EXPECT_EQ(portal.options.value("body").toString(), draft.body);
+    EXPECT_EQ(portal.attachments, QList<QByteArray>{"not really a movie"});
+
+    portal.answer = 1; // the user closed the chooser
+    handedOver.reset();
+    composer.compose(draft, [&](bool ok) { handedOver = ok; });
+    ASSERT_TRUE(waitUntil([&] { return handedOver.has_value(); }));
+    EXPECT_FALSE(*handedOver);
+}
+
+TEST_F(DesktopServicesTest, ShowItemsReachesTheFileManagerAndFailsWithoutOne) {
+    QDBusConnection service = bus.connect("files-service");
+    QDBusConnection client = bus.connect("files-client");
+    DBusFileManager files(client);
+    const QUrl movie = QUrl::fromLocalFile("/tmp/with space/Racer.mp4");
+
+    std::optional<bool> shown;
+    files.showItems({movie}, [&](bool ok) { shown = ok; });
+    ASSERT_TRUE(waitUntil([&] { return shown.has_value(); }));
+    EXPECT_FALSE(*shown) << "no file manager on the bus";
+
+    FakeFileManager1 manager;
+    ASSERT_TRUE(service.registerObject("/org/freedesktop/FileManager1", &manager,
+                                       QDBusConnection::ExportAllSlots));
+    ASSERT_TRUE(service.registerService("org.freedesktop.FileManager1"));
+    shown.reset();
+    files.showItems({movie}, [&](bool ok) { shown = ok; });
+    ASSERT_TRUE(waitUntil([&] { return shown.has_value(); }));
+    EXPECT_TRUE(*shown);
+    EXPECT_EQ(manager.shown, QStringList{"file:///tmp/with%20space/Racer.mp4"});
+}
+
+#include "DesktopServiceFakesTest.moc"

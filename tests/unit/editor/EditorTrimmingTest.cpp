@@ -1,0 +1,103 @@
+// The scrubber's callbacks: scrubbing, the trim handles, edit and preview
+// modes, undo and shake.
+
+#include "EditorOnFakes.h"
+#include "platform/ui/MotionEvent.h"
+
+using namespace platform;
+
+using EditorTrimming = EditorOnFakes;
+
+namespace {
+const QStringList kPadEditing{"cancelTrimButton", "flexSpace", "titleButton", "flexSpace",
+                              "playButton",       "fixSpace",  "trimButton"};
+} // namespace
+
+TEST_F(EditorTrimming, AHandleMovePausesOnItsFrameButLeavesThePauseButton) {
+    makeEditor();
+    editor->movieScrubberDidBeginEditing(editor->avTrimmer.get());
+    EXPECT_TRUE(editor->isTrimming());
+    EXPECT_TRUE(editor->hasEdit());
+    EXPECT_EQ(topItems(), kPadEditing);
+    editor->playAction();
+    settle();
+
+    const int seeks = player().seeks().size();
+    editor->movieScrubber_editingStartValueDidChange(editor->avTrimmer.get(), 3.0);
+    EXPECT_EQ(player().rate(), 0.0f);
+    EXPECT_DOUBLE_EQ(editor->editStartTime, 3.0);
+    EXPECT_TRUE(editor->topToolBar->items().contains(editor->pauseButton));
+    EXPECT_EQ(player().seeks().size(), seeks) << "the seek waits for the callback to return";
+    settle();
+    EXPECT_EQ(player().seeks().last(), MediaTime::make(1800, 600));
+
+    editor->movieScrubber_editingEndValueDidChange(editor->avTrimmer.get(), 6.5);
+    settle();
+    EXPECT_DOUBLE_EQ(editor->editEndTime, 6.5);
+    EXPECT_EQ(player().seeks().last(), MediaTime::make(3900, 600));
+}
+
+TEST_F(EditorTrimming, CancellingKeepsTheRangeAndPutsDoneInPlaceOfCancelForGood) {
+    makeEditor();
+    editor->movieScrubberDidBeginEditing(editor->avTrimmer.get());
+    editor->movieScrubber_editingStartValueDidChange(editor->avTrimmer.get(), 2.0);
+    editor->cancelTrimButton->trigger();
+    EXPECT_FALSE(editor->isTrimming());
+    EXPECT_FALSE(editor->avTrimmer->isEditing());
+    EXPECT_EQ(topItems(),
+              (QStringList{"doneButton", "flexSpace", "titleButton", "flexSpace", "playButton",
+                           "fixSpace", "shareButton", "fixSpace", "saveButton"}));
+    EXPECT_DOUBLE_EQ(editor->editStartTime, 2.0);
+    EXPECT_DOUBLE_EQ(editor->editEndTime, 10.0);
+
+    // On the phone: edit mode has no share or save, and trim at the top right.
+    editor->applyPhoneUILayout();
+    editor->movieScrubberDidBeginEditing(editor->avTrimmer.get());
+    EXPECT_EQ(bottomItems(), (QStringList{"flexSpace", "playButton", "flexSpace"}));
+    EXPECT_EQ(topItems(), (QStringList{"cancelTrimButton", "flexSpace", "titleButton", "flexSpace",
+                                       "trimButton"}));
+    editor->undoAction();
+    EXPECT_EQ(bottomItems(), (QStringList{"shareButton", "flexSpace", "playButton", "flexSpace"}));
+    EXPECT_EQ(topItems(),
+              (QStringList{"doneButton", "flexSpace", "titleButton", "flexSpace", "saveButton"}));
+}
+
+TEST_F(EditorTrimming, UndoAndShakeWaitUntilNoExportRuns) {
+    makeEditor();
+    const MotionEvent shake{MotionEvent::Type::Motion, MotionEvent::Subtype::MotionShake};
+    editor->motionEnded_withEvent(MotionEvent::Subtype::MotionShake, shake);
+    EXPECT_FALSE(editor->isTrimming()) << "a shake outside trimming does nothing";
+
+    editor->movieScrubberDidBeginEditing(editor->avTrimmer.get());
+    editor->setExporting(true);
+    editor->undoAction();
+    editor->motionEnded_withEvent(MotionEvent::Subtype::MotionShake, shake);
+    EXPECT_TRUE(editor->isTrimming());
+    EXPECT_EQ(topItems(), kPadEditing);
+
+    editor->setExporting(false);
+    editor->motionEnded_withEvent(MotionEvent::Subtype::MotionShake, shake);
+    EXPECT_FALSE(editor->isTrimming());
+}
+
+TEST_F(EditorTrimming, ScrubbingSeeksAndLeavesThePlayerPausedWhereItWasLetGo) {
+    makeEditor();
+    editor->playAction();
+    editor->movieScrubberDidBeginScrubbing_withHandle(editor->avTrimmer.get(), {});
+    EXPECT_EQ(player().rate(), 0.0f);
+    EXPECT_TRUE(editor->topToolBar->items().contains(editor->playButton));
+    editor->movieScrubber_valueDidChange(editor->avTrimmer.get(), 4.0);
+    EXPECT_EQ(player().seeks().last(), MediaTime::make(2400, 600));
+
+    editor->avTrimmer->setValue(6.0);
+    editor->movieScrubberDidEndScrubbing_withHandle(editor->avTrimmer.get(), {});
+    EXPECT_FALSE(editor->isScrubbing());
+    EXPECT_EQ(player().seeks().last(), MediaTime::make(3600, 600));
+    EXPECT_EQ(player().rate(), 0.0f);
+    settle();
+
+    editor->playAction();
+    player().advance(0.5);
+    EXPECT_DOUBLE_EQ(editor->avPlayer->currentTime().seconds(), 6.5)
+        << "preview plays on from there";
+}
