@@ -2,7 +2,7 @@
 // and the file manager's ShowItems, against fakes of those services on a
 // private session bus.
 
-#include "PrivateSessionBus.h"
+#include "ShareFakes.h"
 #include "platform/ui/share/DBusFileManager.h"
 #include "platform/ui/share/PortalMailComposer.h"
 #include "support/Wait.h"
@@ -14,6 +14,8 @@
 #include <QDBusObjectPath>
 #include <QDBusUnixFileDescriptor>
 #include <QFile>
+#include <QProcess>
+#include <QStandardPaths>
 #include <QTemporaryDir>
 #include <QTimer>
 #include <gtest/gtest.h>
@@ -74,21 +76,40 @@ class FakeFileManager1 : public QObject {
     void ShowItems(const QStringList& uris, const QString&) { shown += uris; }
 };
 
+// A D-Bus session bus of the test's own, so the fakes own their names on it
+// without touching the user's session; skipped without dbus-daemon.
 class DesktopServicesTest : public ::testing::Test {
   protected:
     void SetUp() override {
-        if (!bus.isRunning())
+        const QString program = QStandardPaths::findExecutable("dbus-daemon");
+        if (program.isEmpty())
             GTEST_SKIP() << "dbus-daemon is not installed";
+        daemon.start(program, {"--session", "--nofork", "--print-address"});
+        ASSERT_TRUE(daemon.waitForStarted(5000));
+        while (!daemon.canReadLine() && daemon.waitForReadyRead(5000)) {
+        }
+        address = QString::fromUtf8(daemon.readLine()).trimmed();
+        ASSERT_FALSE(address.isEmpty());
         qDBusRegisterMetaType<QList<QDBusUnixFileDescriptor>>();
     }
-    testing_support::PrivateSessionBus bus;
+    void TearDown() override {
+        for (const char* name : {"service", "client"})
+            QDBusConnection::disconnectFromBus(name);
+        daemon.terminate();
+        daemon.waitForFinished(3000);
+    }
+    QDBusConnection connect(const char* name) {
+        return QDBusConnection::connectToBus(address, name);
+    }
+    QProcess daemon;
+    QString address;
 };
 
 } // namespace
 
 TEST_F(DesktopServicesTest, ThePortalGetsTheBodyAndTheAttachmentsAsDescriptors) {
-    QDBusConnection service = bus.connect("portal-service");
-    QDBusConnection client = bus.connect("portal-client");
+    QDBusConnection service = connect("service");
+    QDBusConnection client = connect("client");
     PortalMailComposer composer(client);
 
     std::optional<bool> available;
@@ -107,13 +128,10 @@ TEST_F(DesktopServicesTest, ThePortalGetsTheBodyAndTheAttachmentsAsDescriptors) 
     EXPECT_TRUE(*available);
 
     QTemporaryDir dir;
-    QFile movie(dir.filePath("clip.mp4"));
-    ASSERT_TRUE(movie.open(QIODevice::WriteOnly));
-    movie.write("not really a movie");
-    movie.close();
+    testing_support::writeText(dir.filePath("clip.mp4"), "not really a movie");
     MailDraft draft;
     draft.body = "Check out my recording of Racer by Example Games!";
-    draft.attachments = {QUrl::fromLocalFile(movie.fileName())};
+    draft.attachments = {QUrl::fromLocalFile(dir.filePath("clip.mp4"))};
     std::optional<bool> handedOver;
     composer.compose(draft, [&](bool ok) { handedOver = ok; });
     ASSERT_TRUE(waitUntil([&] { return handedOver.has_value(); }));
@@ -129,8 +147,8 @@ TEST_F(DesktopServicesTest, ThePortalGetsTheBodyAndTheAttachmentsAsDescriptors) 
 }
 
 TEST_F(DesktopServicesTest, ShowItemsReachesTheFileManagerAndFailsWithoutOne) {
-    QDBusConnection service = bus.connect("files-service");
-    QDBusConnection client = bus.connect("files-client");
+    QDBusConnection service = connect("service");
+    QDBusConnection client = connect("client");
     DBusFileManager files(client);
     const QUrl movie = QUrl::fromLocalFile("/tmp/with space/Racer.mp4");
 
