@@ -6,7 +6,6 @@ tamsel_add_tests(tamsel_youtube_activity_tests unit
   SOURCES
     youtube/YouTubeFakes.cpp
     youtube/YouTubeActivityTest.cpp
-    youtube/PresentedSnapshotTest.cpp
     media/MediaFixtures.cpp
   LIBS tamsel_youtube tamsel_extension_app tamsel_media_generator tamsel_share_test_support
     Qt6::Test

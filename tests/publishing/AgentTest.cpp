@@ -122,13 +122,6 @@ TEST_F(AgentTest, PublishingTellsTheDelegateInOrderAndEndsWithTheWatchAddress) {
     EXPECT_EQ(form()->phase(), YouTubeUploadForm::Phase::Published);
 }
 
-TEST_F(AgentTest, CancelIsReportedAndNothingIsSent) {
-    show();
-    form()->cancelItem()->trigger();
-    EXPECT_EQ(delegate_->calls, (QStringList{"willBeDisplayed", "cancel"}));
-    EXPECT_TRUE(client_->uploads.isEmpty());
-}
-
 TEST_F(AgentTest, PublishNeedsATitleAndReturnInTheTitlePublishes) {
     signIn_->signedIn = true;
     show(QStringLiteral("  \n "));

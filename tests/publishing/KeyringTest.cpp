@@ -51,10 +51,8 @@ TEST_F(Keyring, TheRefreshTokenLivesInTheSecretStoreAcrossSessionsAndGoesWithSig
     FakeBrowser browser(FakeBrowser::Behaviour::Follow);
     {
         YouTubeGoogleSignIn google;
-        std::optional<platform::ErrorPtr> result;
-        google.signIn([&](platform::ErrorPtr error) { result = error; });
-        ASSERT_TRUE(waitUntil([&] { return result.has_value(); }, 30000));
-        ASSERT_EQ(*result, nullptr) << (*result)->description().toStdString();
+        ASSERT_EQ(awaited<platform::ErrorPtr>([&](auto done) { google.signIn(done); }, 30000),
+                  std::optional<platform::ErrorPtr>(nullptr));
     }
     const QString issued = server_.record().refreshTokens.value(0);
     std::optional<QString> stored;
@@ -66,14 +64,12 @@ TEST_F(Keyring, TheRefreshTokenLivesInTheSecretStoreAcrossSessionsAndGoesWithSig
     // A later session of the editor: nothing in memory, the keyring has it.
     RefreshTokenStore::shared().reset();
     YouTubeGoogleSignIn later;
-    std::optional<platform::ErrorPtr> restored;
-    later.restore([&](platform::ErrorPtr error) { restored = error; });
-    ASSERT_TRUE(waitUntil([&] { return restored.has_value(); }, 10000));
-    EXPECT_EQ(*restored, nullptr);
-    std::optional<platform::ErrorPtr> renewed;
-    later.accessToken(true, [&](const QString&, platform::ErrorPtr e) { renewed = e; });
-    ASSERT_TRUE(waitUntil([&] { return renewed.has_value(); }));
-    EXPECT_EQ(*renewed, nullptr);
+    EXPECT_EQ(awaited<platform::ErrorPtr>([&](auto done) { later.restore(done); }),
+              std::optional<platform::ErrorPtr>(nullptr));
+    EXPECT_EQ(awaited<platform::ErrorPtr>([&](auto done) {
+                  later.accessToken(true, [done](const QString&, auto e) { done(e); });
+              }),
+              std::optional<platform::ErrorPtr>(nullptr));
     EXPECT_EQ(server_.record().refreshes, 1) << "refreshed with the token from the keyring";
 
     later.signOut();

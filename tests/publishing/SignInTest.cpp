@@ -23,23 +23,20 @@ namespace {
 class SignInTest : public ServerFixture {
   protected:
     // What signing in ends with; nullopt when it never ends.
-    std::optional<ErrorPtr> signIn(YouTubeGoogleSignIn& signIn) {
-        std::optional<ErrorPtr> result;
-        signIn.signIn([&](ErrorPtr error) { result = error; });
-        waitUntil([&] { return result.has_value(); }, 20000);
-        return result;
+    static std::optional<ErrorPtr> signIn(YouTubeGoogleSignIn& google) {
+        return awaited<ErrorPtr>([&](auto done) { google.signIn(done); }, 20000);
     }
-    std::optional<ErrorPtr> restore(YouTubeGoogleSignIn& signIn) {
-        std::optional<ErrorPtr> result;
-        signIn.restore([&](ErrorPtr error) { result = error; });
-        waitUntil([&] { return result.has_value(); });
-        return result;
+    static std::optional<ErrorPtr> restore(YouTubeGoogleSignIn& google) {
+        return awaited<ErrorPtr>([&](auto done) { google.restore(done); });
     }
-    std::pair<QString, ErrorPtr> token(YouTubeGoogleSignIn& signIn, bool renew) {
-        std::optional<std::pair<QString, ErrorPtr>> result;
-        signIn.accessToken(renew, [&](const QString& t, ErrorPtr e) { result = std::pair{t, e}; });
-        EXPECT_TRUE(waitUntil([&] { return result.has_value(); }));
-        return result.value_or(std::pair<QString, ErrorPtr>());
+    static std::pair<QString, ErrorPtr> token(YouTubeGoogleSignIn& google, bool renew) {
+        return awaited<std::pair<QString, ErrorPtr>>([&](auto done) {
+                   google.accessToken(renew, [done](const QString& t, ErrorPtr e) {
+                       done({t, e});
+                   });
+               })
+            .value_or(std::pair{QString(),
+                                PublishingError::make(PublishingError::BadResponse, "no answer")});
     }
 };
 

@@ -155,20 +155,6 @@ TEST_F(ActivitySheetTest, AClickRunsTheActivityAndItsEndIsReportedOnce) {
     EXPECT_FALSE(completed) << "failed, so not completed";
 }
 
-TEST_F(ActivitySheetTest, AnActivitysControllerIsPresentedAndDismissedWhenItFinishes) {
-    auto youTube = std::make_shared<FakeActivity>("TXPublishToYouTube", "YouTube");
-    youTube->controller = std::make_shared<ViewController>();
-    auto sheet = sheetWith({youTube});
-    ASSERT_TRUE(sheet->performActivityNamed("YouTube")) << "found by its title too";
-    ASSERT_TRUE(
-        waitUntil([&] { return root->presentedViewController() == youTube->controller.get(); }));
-    EXPECT_FALSE(youTube->calls.contains("perform"));
-    youTube->activityDidFinish(true);
-    ASSERT_TRUE(waitUntil([&] { return root->presentedViewController() == nullptr; }));
-    EXPECT_EQ(type, "TXPublishToYouTube");
-    EXPECT_TRUE(completed);
-}
-
 TEST_F(ActivitySheetTest, TheKeyboardReachesEveryRowAndEscapeCancels) {
     builtIn(MailActivityType);
     auto save = builtIn(SaveToFilesActivityType);

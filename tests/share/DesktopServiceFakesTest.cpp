@@ -22,7 +22,7 @@
 #include <unistd.h>
 
 using namespace platform;
-using testing_support::waitUntil;
+using namespace testing_support;
 
 namespace {
 
@@ -109,62 +109,47 @@ class DesktopServicesTest : public ::testing::Test {
 
 TEST_F(DesktopServicesTest, ThePortalGetsTheBodyAndTheAttachmentsAsDescriptors) {
     QDBusConnection service = connect("service");
-    QDBusConnection client = connect("client");
-    PortalMailComposer composer(client);
-
-    std::optional<bool> available;
-    composer.checkAvailability([&](bool a) { available = a; });
-    ASSERT_TRUE(waitUntil([&] { return available.has_value(); }));
-    EXPECT_FALSE(*available) << "no portal on the bus yet";
-
+    PortalMailComposer composer(connect("client"));
+    const auto available = [&] {
+        return awaited<bool>([&](auto done) { composer.checkAvailability(done); });
+    };
+    EXPECT_EQ(available(), false) << "no portal on the bus yet";
     FakeEmailPortal portal(service);
     ASSERT_TRUE(service.registerObject("/org/freedesktop/portal/desktop", &portal,
                                        QDBusConnection::ExportAllSlots |
                                            QDBusConnection::ExportAllProperties));
     ASSERT_TRUE(service.registerService("org.freedesktop.portal.Desktop"));
-    available.reset();
-    composer.checkAvailability([&](bool a) { available = a; });
-    ASSERT_TRUE(waitUntil([&] { return available.has_value(); }));
-    EXPECT_TRUE(*available);
+    EXPECT_EQ(available(), true);
 
     QTemporaryDir dir;
-    testing_support::writeText(dir.filePath("clip.mp4"), "not really a movie");
+    writeText(dir.filePath("clip.mp4"), "not really a movie");
     MailDraft draft;
     draft.body = "Check out my recording of Racer by Example Games!";
     draft.attachments = {QUrl::fromLocalFile(dir.filePath("clip.mp4"))};
-    std::optional<bool> handedOver;
-    composer.compose(draft, [&](bool ok) { handedOver = ok; });
-    ASSERT_TRUE(waitUntil([&] { return handedOver.has_value(); }));
-    EXPECT_TRUE(*handedOver);
+    const auto compose = [&] {
+        return awaited<bool>([&](auto done) { composer.compose(draft, done); });
+    };
+    EXPECT_EQ(compose(), true);
     EXPECT_EQ(portal.options.value("body").toString(), draft.body);
     EXPECT_EQ(portal.attachments, QList<QByteArray>{"not really a movie"});
-
     portal.answer = 1; // the user closed the chooser
-    handedOver.reset();
-    composer.compose(draft, [&](bool ok) { handedOver = ok; });
-    ASSERT_TRUE(waitUntil([&] { return handedOver.has_value(); }));
-    EXPECT_FALSE(*handedOver);
+    EXPECT_EQ(compose(), false);
 }
 
 TEST_F(DesktopServicesTest, ShowItemsReachesTheFileManagerAndFailsWithoutOne) {
     QDBusConnection service = connect("service");
-    QDBusConnection client = connect("client");
-    DBusFileManager files(client);
-    const QUrl movie = QUrl::fromLocalFile("/tmp/with space/Racer.mp4");
-
-    std::optional<bool> shown;
-    files.showItems({movie}, [&](bool ok) { shown = ok; });
-    ASSERT_TRUE(waitUntil([&] { return shown.has_value(); }));
-    EXPECT_FALSE(*shown) << "no file manager on the bus";
-
+    DBusFileManager files(connect("client"));
+    const auto show = [&] {
+        return awaited<bool>([&](auto done) {
+            files.showItems({QUrl::fromLocalFile("/tmp/with space/Racer.mp4")}, done);
+        });
+    };
+    EXPECT_EQ(show(), false) << "no file manager on the bus";
     FakeFileManager1 manager;
     ASSERT_TRUE(service.registerObject("/org/freedesktop/FileManager1", &manager,
                                        QDBusConnection::ExportAllSlots));
     ASSERT_TRUE(service.registerService("org.freedesktop.FileManager1"));
-    shown.reset();
-    files.showItems({movie}, [&](bool ok) { shown = ok; });
-    ASSERT_TRUE(waitUntil([&] { return shown.has_value(); }));
-    EXPECT_TRUE(*shown);
+    EXPECT_EQ(show(), true);
     EXPECT_EQ(manager.shown, QStringList{"file:///tmp/with%20space/Racer.mp4"});
 }
 

@@ -11,6 +11,7 @@
 #include "platform/ui/share/ActivityViewController.h"
 #include "platform/ui/share/FileManagerService.h"
 #include "platform/ui/share/SaveLocationChooser.h"
+#include "support/Wait.h"
 
 #include <QList>
 #include <QUrl>
@@ -24,6 +25,17 @@ template <class Service, class Fake> struct InPlace {
         Service::implementation().replace([fake = fake] { return fake; });
     Fake* operator->() const { return fake.get(); }
 };
+
+// What an asynchronous call answers: `call` starts it with the handler of
+// its answer; waits on the event loop for that, nullopt when it never comes.
+template <class T>
+std::optional<T> awaited(const std::function<void(std::function<void(T)>)>& call,
+                         int timeoutMs = 10000) {
+    auto answer = std::make_shared<std::optional<T>>();
+    call([answer](T value) { *answer = std::move(value); });
+    waitUntil([&] { return answer->has_value(); }, timeoutMs);
+    return *answer;
+}
 
 // Writes `text` to `path`, creating its folder; `executable` for scripts.
 void writeText(const QString& path, const QByteArray& text, bool executable = false);

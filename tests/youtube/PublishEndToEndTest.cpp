@@ -127,22 +127,3 @@ tap doneButton
     EXPECT_EQ(run.hostReport, "[]");
     EXPECT_TRUE(server.record().uploads.isEmpty());
 }
-
-TEST_F(PublishEndToEnd, AFailedUploadIsReportedAsDoneWhenTheAlertIsClosed) {
-    server.setFaults({.quotaExceeded = 1});
-    const Run run = publish(QStringLiteral(R"(wait ready
-tap shareButton
-share YouTube
-wait form
-fill title "Racer lap"
-press "Publish"
-wait alert 120
-dump
-press "Close"
-sleep 1
-tap doneButton
-)"));
-    ASSERT_EQ(run.dumps.size(), 1);
-    EXPECT_EQ(run.dumps[0]["alert"].toString(), "Your video could not be published.");
-    EXPECT_EQ(run.hostReport, R"(["TXPublishToYouTube"])");
-}

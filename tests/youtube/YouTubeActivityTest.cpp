@@ -103,11 +103,7 @@ TEST_F(ActivityFixture, IdentityIsFixedAndTheDeviceDecidesWhetherItCanPerform) {
         EXPECT_FALSE(activity->canPerformWithActivityItems(items()));
     }
     EXPECT_EQ(activity->activityImage().deviceIndependentSize(), QSizeF(48, 48));
-    // On a tile with rounded corners: the corner is clear, the middle drawn.
-    const QImage settings = activity->_activitySettingsImage();
-    EXPECT_EQ(settings.deviceIndependentSize(), QSizeF(29, 29));
-    EXPECT_EQ(qAlpha(settings.pixel(0, 0)), 0);
-    EXPECT_EQ(qAlpha(settings.pixel(settings.width() / 2, settings.height() / 2)), 255);
+    EXPECT_EQ(activity->_activitySettingsImage().deviceIndependentSize(), QSizeF(29, 29));
 }
 
 TEST_F(ActivityFixture, TheUploadFileIsNamedByTheSecondInTheTemporaryDirectory) {
@@ -205,39 +201,34 @@ TEST_F(ActivityFixture, TheControllerIsTheAgentsStackWithTheDescriptionFilledIn)
                            "class " + PublishingPlugin::youTubeAgentClassName}));
 }
 
-TEST_F(ActivityFixture, TheCategoryWithIdentifierTwentyIsPreselected) {
+// Each request for the controller exchanges the preselection code between
+// the form's class and the activity: the odd ones put the activity's in place.
+TEST_F(ActivityFixture, TheCategoryWithIdentifierTwentyIsPreselectedUntilTheNextRequest) {
     pick();
-    form()->categoriesDidArrive({"10:Music", "20:Gaming", "22:People & Blogs"});
-    EXPECT_EQ(form()->members_.calls, (QStringList{"category Gaming", "select 1 0 0"}));
-    EXPECT_EQ(form()->defaultCategory, "20");
+    FakeUploadForm* first = form();
+    first->categoriesDidArrive({"10:Music", "20:Gaming", "22:People & Blogs"});
+    EXPECT_EQ(first->members_.calls, (QStringList{"category Gaming", "select 1 0 0"}));
+    EXPECT_EQ(first->defaultCategory, "20");
     // Without the category, or without any, the form is left as it was.
-    form()->categoriesDidArrive({"1:Film", "2:Autos"});
-    form()->categoriesDidArrive({});
-    EXPECT_EQ(form()->members_.calls.size(), 2);
-    EXPECT_EQ(form()->defaultCategory, "20");
-    EXPECT_EQ(form()->ownSelections, 0);
+    first->categoriesDidArrive({"1:Film", "2:Autos"});
+    first->categoriesDidArrive({});
+    EXPECT_EQ(first->members_.calls.size(), 2);
+    EXPECT_EQ(first->defaultCategory, "20");
+    EXPECT_EQ(first->ownSelections, 0);
+
+    FakePublishingAgent::nextFormHasMembers = false;
+    activity->activityViewController();
+    first->categoriesDidArrive({"10:Music", "20:Gaming"});
+    EXPECT_EQ(first->ownSelections, 1) << "the second request swapped the form's own back";
+    EXPECT_EQ(first->members_.calls.size(), 2);
 
     // A form without its members is neither filled nor preselected, but shown.
-    FakePublishingAgent::nextFormHasMembers = false;
-    activity->activityViewController();              // the second request swaps the code back
-    EXPECT_TRUE(activity->activityViewController()); // and the third in again
+    EXPECT_TRUE(activity->activityViewController());
     form()->categoriesDidArrive({"20:Gaming"});
+    EXPECT_EQ(form()->ownSelections, 0);
     EXPECT_EQ(form()->members_.description.value, "");
     EXPECT_EQ(form()->members_.description.placeholder, "Description");
     EXPECT_TRUE(form()->members_.calls.isEmpty());
-}
-
-TEST_F(ActivityFixture, ASecondControllerRequestSwapsThePreselectionBackToTheFormsOwn) {
-    pick();
-    FakeUploadForm* first = form();
-    activity->activityViewController();
-    ASSERT_NE(form(), first);
-    for (FakeUploadForm* each : {first, form()}) {
-        each->categoriesDidArrive({"10:Music", "20:Gaming"});
-        EXPECT_EQ(each->ownSelections, 1);
-        EXPECT_TRUE(each->members_.calls.isEmpty());
-        EXPECT_EQ(each->defaultCategory, "22");
-    }
 }
 
 // A device without the plug-in, or with one that lacks the agent class,

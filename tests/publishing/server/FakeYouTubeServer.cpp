@@ -7,7 +7,6 @@
 #include <QJsonArray>
 #include <QJsonDocument>
 #include <QJsonObject>
-#include <QPointer>
 #include <QRandomGenerator>
 #include <QRegularExpression>
 #include <QSet>
@@ -122,9 +121,8 @@ struct FakeYouTubeServer::Shared {
     }
 };
 
-// Serves the connections on the server's thread. Requests on a connection
-// are answered in order: while an answer waits (a slow server), the next
-// request stays unread.
+// Serves the connections on the server's thread, one request at a time on
+// each (clients that pipeline requests are not served).
 class FakeYouTubeServer::Worker : public QObject {
   public:
     explicit Worker(std::shared_ptr<Shared> shared) : s_(std::move(shared)) {}
@@ -150,14 +148,12 @@ class FakeYouTubeServer::Worker : public QObject {
     struct Connection {
         QByteArray buffer;
         std::optional<Request> request; // its headers read
-        bool answering = false;
     };
 
     void read(QTcpSocket* socket) {
-        auto found = connections_.find(socket);
-        if (found == connections_.end() || found->answering)
+        if (!connections_.contains(socket))
             return;
-        Connection& c = *found;
+        Connection& c = connections_[socket];
         c.buffer += socket->readAll();
         if (!c.request) {
             const qsizetype end = c.buffer.indexOf("\r\n\r\n");
@@ -237,15 +233,7 @@ class FakeYouTubeServer::Worker : public QObject {
             delay = s_->faults.responseDelayMs;
             s_->record.unauthorized += response.status == 401;
         }
-        connections_[socket].answering = true;
-        QTimer::singleShot(delay, this, [this, alive = QPointer<QTcpSocket>(socket), bytes] {
-            if (!alive || !connections_.contains(alive))
-                return;
-            connections_[alive].answering = false;
-            alive->write(bytes);
-            if (!connections_[alive].buffer.isEmpty() || alive->bytesAvailable() > 0)
-                read(alive);
-        });
+        QTimer::singleShot(delay, socket, [socket, bytes] { socket->write(bytes); });
     }
 
     Response handle(const Request& request) {
