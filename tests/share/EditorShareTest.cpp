@@ -67,25 +67,6 @@ class EditorShareTest : public EditorOnFakes {
 
 } // namespace
 
-TEST_F(EditorShareTest, SharesTheStoreTextTheLinkAndTheRecording) {
-    show();
-    const auto sheet = share();
-    ASSERT_TRUE(sheet);
-    EXPECT_EQ(
-        sheet->activityItems(),
-        (QVariantList{QStringLiteral("Check out my recording of Racer by Example Games!"),
-                      QStringLiteral("https://store.example/apps/org.example.Racer"), recording}));
-    EXPECT_EQ(log.count("displayShareSheetWithVideoURL"), 1);
-    EXPECT_EQ(store->requests.size(), 1);
-    EXPECT_EQ(sheet->excludedActivityTypes(), QStringList{CopyToPasteboardActivityType});
-    EXPECT_TRUE(sheet->applicationActivities().isEmpty()) << "no publishing support here";
-    EXPECT_TRUE(sheet->preferredActivityOrder().isEmpty());
-    EXPECT_TRUE(sheet->hasCompletionWithItemsHandler());
-    // The wide layout: a popover at the share item.
-    EXPECT_EQ(sheet->modalPresentationStyle(), ViewController::ModalPresentationStyle::Popover);
-    EXPECT_EQ(sheet->popoverItem(), editor->shareButton);
-}
-
 TEST_F(EditorShareTest, TheTextIsTheOverrideMessageOrTheNameAloneWithoutAnAuthor) {
     show();
     editor->overrideShareMessage = "Look at this";
@@ -116,6 +97,7 @@ TEST_F(EditorShareTest, YouTubeIsOfferedOnlyWithoutItsOwnExtensionAndWithSupport
     auto sheet = share();
     EXPECT_TRUE(sheet->applicationActivities().isEmpty()) << "the YouTube application shares";
     EXPECT_TRUE(sheet->preferredActivityOrder().isEmpty());
+    EXPECT_EQ(sheet->excludedActivityTypes(), QStringList{CopyToPasteboardActivityType});
 
     extensions->installed.insert(ExtensionRegistry::youTubeShareExtensionIdentifier, false);
     sheet = share();
@@ -132,14 +114,26 @@ TEST_F(EditorShareTest, YouTubeIsOfferedOnlyWithoutItsOwnExtensionAndWithSupport
     EXPECT_TRUE(share()->applicationActivities().isEmpty()) << "no plug-in, no YouTube";
 }
 
-TEST_F(EditorShareTest, AfterATrimmedSaveTheRecordingAsReceivedIsShared) {
+// The store's text and link, and the recording as received even after a
+// trimmed save, in a popover at the share item of the wide layout.
+TEST_F(EditorShareTest, SharesTheStoreTextTheLinkAndTheRecordingAsReceived) {
     show();
     // What the trimmed save's completion does: the player moves to the clip.
     const QUrl clip = QUrl::fromLocalFile(QStringLiteral("/clips/Racer_T.mp4"));
     fakes.world().addMovie(clip, fakes::FakeMovie{});
     editor->reloadAVLayerWithURL(clip);
     ASSERT_EQ(editor->videoURL, clip);
-    EXPECT_EQ(share()->activityItems().last(), recording);
+    const auto sheet = share();
+    ASSERT_TRUE(sheet);
+    EXPECT_EQ(
+        sheet->activityItems(),
+        (QVariantList{QStringLiteral("Check out my recording of Racer by Example Games!"),
+                      QStringLiteral("https://store.example/apps/org.example.Racer"), recording}));
+    EXPECT_EQ(log.count("displayShareSheetWithVideoURL"), 1);
+    EXPECT_EQ(store->requests.size(), 1);
+    EXPECT_TRUE(sheet->hasCompletionWithItemsHandler());
+    EXPECT_EQ(sheet->modalPresentationStyle(), ViewController::ModalPresentationStyle::Popover);
+    EXPECT_EQ(sheet->popoverItem(), editor->shareButton);
 }
 
 TEST_F(EditorShareTest, CompletedActivitiesAreRecordedEachTimeAndOthersNot) {
