@@ -1,6 +1,6 @@
 # The YouTube publishing plug-in: loaded as the editor loads it; its upload
 # client and sign-in against the local fake of the service; its form; the
-# refresh token in a real keyring; a screenshot of the form under Xvfb.
+# refresh token in a real keyring.
 if(NOT TARGET tamsel_fake_youtube)
   add_subdirectory(${CMAKE_CURRENT_SOURCE_DIR}/publishing/server
                    ${CMAKE_CURRENT_BINARY_DIR}/publishing-server)
@@ -12,11 +12,10 @@ target_include_directories(tamsel-wrong-abi-plugin PRIVATE ${PROJECT_SOURCE_DIR}
 target_link_libraries(tamsel-wrong-abi-plugin PRIVATE Qt6::Core tamsel_warnings)
 set_target_properties(tamsel-wrong-abi-plugin PROPERTIES CXX_VISIBILITY_PRESET hidden)
 
-# Loads the built plug-in through the loader, as the editor does.
+# The loader, as the editor uses it, refuses what it cannot use.
 tamsel_add_tests(tamsel_publishing_plugin_tests integration
   SOURCES publishing/PluginLoadTest.cpp
-  LIBS tamsel_platform_publishing Qt6::Widgets
-  MAIN tamsel_ui_test_main)
+  LIBS tamsel_platform_publishing)
 tamsel_host_publishing_plugins(tamsel_publishing_plugin_tests)
 add_dependencies(tamsel_publishing_plugin_tests tamsel-youtube-publishing tamsel-wrong-abi-plugin)
 target_compile_definitions(tamsel_publishing_plugin_tests PRIVATE
@@ -24,13 +23,12 @@ target_compile_definitions(tamsel_publishing_plugin_tests PRIVATE
 
 # The plug-in's sign-in and upload client against the local fake service.
 add_library(tamsel_publishing_test_support STATIC
-  publishing/FakeBrowser.cpp
   publishing/FakePublishingServices.cpp
   publishing/ServerFixture.cpp)
 target_include_directories(tamsel_publishing_test_support PUBLIC ${CMAKE_CURRENT_SOURCE_DIR}/publishing)
 target_link_libraries(tamsel_publishing_test_support
   PUBLIC tamsel_fake_youtube tamsel_youtube_publishing_objects tamsel_platform_publishing
-         tamsel_test_support Qt6::Network
+         tamsel_share_test_support tamsel_test_support Qt6::Network
   PRIVATE tamsel_warnings)
 
 tamsel_add_tests(tamsel_publishing_service_tests integration
@@ -61,19 +59,3 @@ tamsel_add_tests(tamsel_publishing_unit_tests unit
     publishing/VideoMetadataTest.cpp
   LIBS tamsel_publishing_test_support Qt6::Widgets Qt6::Test
   MAIN tamsel_ui_test_main)
-
-# The form under Xvfb, pre-filled and publishing under the progress overlay.
-find_program(TAMSEL_XVFB_RUN xvfb-run)
-add_executable(tamsel-publishing-screenshots publishing/FormScreenshots.cpp)
-target_link_libraries(tamsel-publishing-screenshots PRIVATE
-  tamsel_publishing_test_support tamsel_youtube tamsel_warnings)
-add_dependencies(tamsel-publishing-screenshots tamsel_resources)
-if(TAMSEL_XVFB_RUN)
-  tamsel_add_tests(tamsel_publishing_screenshot_tests integration
-    SOURCES publishing/FormScreenshotTest.cpp
-    MAIN tamsel_ui_test_main)
-  target_compile_definitions(tamsel_publishing_screenshot_tests PRIVATE
-    TAMSEL_SCREENSHOTS="$<TARGET_FILE:tamsel-publishing-screenshots>"
-    TAMSEL_XVFB_RUN="${TAMSEL_XVFB_RUN}")
-  add_dependencies(tamsel_publishing_screenshot_tests tamsel-publishing-screenshots)
-endif()

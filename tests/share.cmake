@@ -3,11 +3,7 @@
 find_package(Qt6 REQUIRED COMPONENTS Network Test Widgets)
 
 # Doubles of the share services; never linked into the product.
-add_library(tamsel_share_test_support STATIC
-  share/LocalHttpServer.cpp
-  share/PrivateSessionBus.cpp
-  share/ShareFakes.cpp
-)
+add_library(tamsel_share_test_support STATIC share/ShareFakes.cpp)
 target_include_directories(tamsel_share_test_support PUBLIC ${CMAKE_CURRENT_SOURCE_DIR}/share)
 target_link_libraries(tamsel_share_test_support
   PUBLIC tamsel_test_support tamsel_platform_store tamsel_platform_share Qt6::Network
@@ -29,8 +25,6 @@ tamsel_add_tests(tamsel_editor_share_tests unit
   MAIN tamsel_ui_test_main)
 
 tamsel_add_tests(tamsel_share_end_to_end_tests integration
-  SOURCES share/ShareEndToEndTest.cpp editor/EndToEndFixture.cpp
+  SOURCES share/ShareEndToEndTest.cpp share/ShareDesktop.cpp editor/EndToEndFixture.cpp
   LIBS tamsel_share_test_support tamsel_platform_media tamsel_media_generator)
 add_dependencies(tamsel_share_end_to_end_tests tamsel-edit tamsel-video-editor)
-target_compile_definitions(tamsel_share_end_to_end_tests PRIVATE
-  TAMSEL_SHARE_TEST_DIR="${CMAKE_CURRENT_SOURCE_DIR}/share")

@@ -1,7 +1,11 @@
+// The publishing agent and its form, on fakes of the sign-in and the upload
+// client: what it tells its delegate, what it sends, and what the form shows.
+
 #include "CategoryPicker.h"
 #include "FakePublishingServices.h"
 #include "FormTextCell.h"
 #include "MediaFileWaiter.h"
+#include "ShareFakes.h"
 #include "YouTubePublishingAgent.h"
 #include "YouTubeUploadForm.h"
 #include "support/TempDir.h"
@@ -14,7 +18,6 @@
 
 #include <QFile>
 #include <QLineEdit>
-#include <QStringList>
 #include <QTest>
 #include <gtest/gtest.h>
 
@@ -23,8 +26,7 @@ namespace PublishingError = platform::PublishingError;
 
 namespace {
 
-class RecordingDelegate : public platform::PublishingAgentDelegate {
-  public:
+struct RecordingDelegate : platform::PublishingAgentDelegate {
     QStringList calls;
     platform::ErrorPtr endError;
     void publishingAgentWillBeDisplayed(platform::PublishingAgent*) override {
@@ -51,14 +53,23 @@ class Preselector : public QObject {
 
 class AgentTest : public ::testing::Test {
   protected:
-    void SetUp() override {
+    // The agent, handed the upload file's device path, shown in a window
+    // once its categories are in, with `title` typed; the file is written
+    // unless `withFile` is false.
+    void show(const QString& title = QStringLiteral("Run"), bool withFile = true) {
         mobile_.makeLibrary();
-        mediaPath_ = QStringLiteral("/private/var/mobile/Library/Tamsel//TXCapture_YouTube1.mp4");
-        hostPath_ = mobile_.hostPath(QStringLiteral("Library/Tamsel/TXCapture_YouTube1.mp4"));
-        agent_ = std::make_shared<YouTubePublishingAgent>();
+        if (withFile)
+            writeFile(hostPath_, 4096);
         agent_->setDelegate(delegate_);
-        agent_->setMediaPath(mediaPath_);
+        agent_->setMediaPath(QStringLiteral("/private/var/mobile/Library/Tamsel//") +
+                             QFileInfo(hostPath_).fileName());
         agent_->mediaWaiter()->setPollInterval(20);
+        window_ = std::make_unique<platform::Window>();
+        window_->resize(540, 620);
+        window_->setRootViewController(agent_->navigationController());
+        window_->show();
+        ASSERT_TRUE(waitUntil([&] { return !form()->categories().isEmpty(); }));
+        form()->titleCell()->setValue(title);
     }
     void TearDown() override {
         window_.reset();
@@ -66,52 +77,44 @@ class AgentTest : public ::testing::Test {
         platform::MainQueue::runPending();
     }
 
-    void show() {
-        window_ = std::make_unique<platform::Window>();
-        window_->resize(540, 620);
-        window_->setRootViewController(agent_->navigationController());
-        window_->show();
-        ASSERT_TRUE(waitUntil([&] { return !form()->categories().isEmpty(); }));
-    }
-
     YouTubeUploadForm* form() const { return agent_->form(); }
     void publish() { form()->publishItem()->trigger(); }
+    bool uploaded() {
+        return waitUntil([&] { return !client_->uploads.isEmpty(); });
+    }
 
     MobileRoot mobile_;
-    ScopedFakeServices services_;
+    QString hostPath_ = mobile_.hostPath(QStringLiteral("Library/Tamsel/TXCapture_YouTube1.mp4"));
+    InPlace<platform::YouTubeSignIn, FakeSignIn> signIn_;
+    InPlace<platform::YouTubeUploadClient, FakeUploadClient> client_;
     std::shared_ptr<RecordingDelegate> delegate_ = std::make_shared<RecordingDelegate>();
-    std::shared_ptr<YouTubePublishingAgent> agent_;
+    std::shared_ptr<YouTubePublishingAgent> agent_ = std::make_shared<YouTubePublishingAgent>();
     std::unique_ptr<platform::Window> window_;
-    QString mediaPath_;
-    QString hostPath_;
 };
 
 } // namespace
 
 TEST_F(AgentTest, PublishingTellsTheDelegateInOrderAndEndsWithTheWatchAddress) {
-    services_.signIn->signedIn = true;
-    writeFile(hostPath_, 4096);
-    show();
+    signIn_->signedIn = true;
+    show(QStringLiteral("Racer run"));
     EXPECT_EQ(delegate_->calls, QStringList{"willBeDisplayed"});
-    form()->titleCell()->setValue(QStringLiteral("Racer run"));
     form()->descriptionCell()->setValue(QStringLiteral("T L"));
     form()->setPrivacyStatus(QStringLiteral("unlisted"));
     publish();
     EXPECT_EQ(delegate_->calls, (QStringList{"willBeDisplayed", "done", "didBegin"}));
-    ASSERT_TRUE(waitUntil([&] { return !services_.client->uploads.isEmpty(); }));
-    const platform::YouTubeUpload sent = services_.client->uploads.first();
+    ASSERT_TRUE(uploaded());
+    const platform::YouTubeUpload sent = client_->uploads.first();
     EXPECT_EQ(sent.filePath, hostPath_) << "the device path, mapped onto this machine";
-    EXPECT_EQ(sent.title, "Racer run");
-    EXPECT_EQ(sent.description, "T L");
-    EXPECT_EQ(sent.privacyStatus, "unlisted");
-    EXPECT_EQ(sent.categoryId, "22") << "the form's own default";
+    EXPECT_EQ(QStringList({sent.title, sent.description, sent.privacyStatus, sent.categoryId}),
+              QStringList({"Racer run", "T L", "unlisted", "22"}))
+        << "22: the form's own default category";
 
-    services_.client->progress(40, 100);
+    client_->progress(40, 100);
     EXPECT_DOUBLE_EQ(form()->uploadProgress(), 0.4);
     EXPECT_TRUE(form()->statusText().contains(QStringLiteral("40%")));
     EXPECT_FALSE(form()->publishItem()->isEnabled());
     EXPECT_FALSE(form()->cancelItem()->isEnabled());
-    services_.client->succeed(QStringLiteral("abc123"));
+    client_->succeed(QStringLiteral("abc123"));
     EXPECT_EQ(delegate_->calls, (QStringList{"willBeDisplayed", "done", "didBegin", "didEnd"}));
     EXPECT_EQ(delegate_->endError, nullptr);
     EXPECT_EQ(agent_->mediaURL(), "https://www.youtube.com/watch?v=abc123");
@@ -119,18 +122,10 @@ TEST_F(AgentTest, PublishingTellsTheDelegateInOrderAndEndsWithTheWatchAddress) {
     EXPECT_EQ(form()->phase(), YouTubeUploadForm::Phase::Published);
 }
 
-TEST_F(AgentTest, CancelIsReportedAndNothingIsSent) {
-    show();
-    form()->cancelItem()->trigger();
-    EXPECT_EQ(delegate_->calls, (QStringList{"willBeDisplayed", "cancel"}));
-    EXPECT_TRUE(services_.client->uploads.isEmpty());
-}
-
 TEST_F(AgentTest, PublishNeedsATitleAndReturnInTheTitlePublishes) {
-    services_.signIn->signedIn = true;
-    show();
+    signIn_->signedIn = true;
+    show(QStringLiteral("  \n "));
     auto* field = qobject_cast<QLineEdit*>(form()->titleCell()->editor());
-    form()->titleCell()->setValue(QStringLiteral("  \n "));
     EXPECT_FALSE(form()->publishItem()->isEnabled());
     publish();
     QTest::keyClick(field, Qt::Key_Return);
@@ -141,86 +136,73 @@ TEST_F(AgentTest, PublishNeedsATitleAndReturnInTheTitlePublishes) {
     EXPECT_EQ(delegate_->calls, (QStringList{"willBeDisplayed", "done", "didBegin"}));
 }
 
-TEST_F(AgentTest, WithoutAnAccountPublishSignsInFirstAndAFailedSignInEndsPublishing) {
-    writeFile(hostPath_, 10);
-    show();
-    form()->titleCell()->setValue(QStringLiteral("Run"));
-    services_.signIn->signInAnswer = PublishingError::make(
-        PublishingError::SignInCancelled, QStringLiteral("Signing in was cancelled"));
-    publish();
-    ASSERT_TRUE(waitUntil([&] { return delegate_->calls.contains("didEnd"); }));
-    EXPECT_EQ(services_.signIn->signInCalls, 1);
-    EXPECT_TRUE(PublishingError::is(delegate_->endError, PublishingError::SignInCancelled));
-    EXPECT_TRUE(services_.client->uploads.isEmpty());
-    EXPECT_EQ(form()->phase(), YouTubeUploadForm::Phase::Failed);
-    EXPECT_TRUE(form()->statusText().contains(QStringLiteral("cancelled")));
-}
-
-TEST_F(AgentTest, WithoutAnAccountPublishSignsInThenUploads) {
-    writeFile(hostPath_, 10);
-    show();
-    form()->titleCell()->setValue(QStringLiteral("Run"));
-    publish();
-    ASSERT_TRUE(waitUntil([&] { return !services_.client->uploads.isEmpty(); }));
-    EXPECT_EQ(services_.signIn->signInCalls, 1);
+// Each way publishing can fail ends it once, with the error in the form and
+// no watch address.
+TEST_F(AgentTest, AFailureEndsPublishingOnceAndTheFormSaysWhy) {
+    const struct {
+        const char* what;
+        bool signedIn, withFile;
+        PublishingError::Code code;
+        QString shown;
+    } cases[] = {
+        {"a refused sign-in", false, true, PublishingError::SignInCancelled, "cancelled"},
+        {"an export that never finishes", true, false, PublishingError::MediaNotReady, ""},
+        {"a failed upload", true, true, PublishingError::QuotaExceeded, "quota is used up"},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.what);
+        window_.reset();
+        delegate_->calls.clear();
+        agent_ = std::make_shared<YouTubePublishingAgent>();
+        signIn_->signedIn = c.signedIn;
+        signIn_->signInAnswer =
+            PublishingError::make(PublishingError::SignInCancelled, "Signing in was cancelled");
+        QFile::remove(hostPath_);
+        show(QStringLiteral("Run"), c.withFile);
+        agent_->mediaWaiter()->setStallTimeout(300);
+        publish();
+        if (c.code == PublishingError::QuotaExceeded) {
+            ASSERT_TRUE(uploaded());
+            client_->fail(c.code, c.shown);
+        }
+        ASSERT_TRUE(waitUntil([&] { return delegate_->calls.contains("didEnd"); }, 5000));
+        EXPECT_TRUE(PublishingError::is(delegate_->endError, c.code));
+        EXPECT_EQ(delegate_->calls.count("didEnd"), 1);
+        EXPECT_EQ(form()->phase(), YouTubeUploadForm::Phase::Failed);
+        EXPECT_TRUE(form()->statusText().contains(c.shown));
+        EXPECT_TRUE(agent_->mediaURL().isEmpty());
+        client_->uploads.clear();
+    }
+    EXPECT_EQ(signIn_->signInCalls, 1) << "without an account, publishing signs in first";
 }
 
 // The activity hands over the path while its export still writes: nothing is
 // sent until the file has been renamed into place.
 TEST_F(AgentTest, WaitsForTheExportToFinishBeforeSendingAByte) {
-    services_.signIn->signedIn = true;
-    show();
+    signIn_->signedIn = true;
+    show(QStringLiteral("Run"), false);
     const QString partial =
         mobile_.hostPath(QStringLiteral("Library/Tamsel/.TXCapture_YouTube1.mp4.0123abcd.part"));
     writeFile(partial, 100);
-    form()->titleCell()->setValue(QStringLiteral("Run"));
     agent_->mediaWaiter()->setStallTimeout(2000);
     publish();
     for (int i = 0; i < 5; ++i) {
         waitUntil([] { return false; }, 100);
         writeFile(partial, 200 + i * 100); // the export goes on
     }
-    EXPECT_TRUE(services_.client->uploads.isEmpty());
+    EXPECT_TRUE(client_->uploads.isEmpty());
     EXPECT_FALSE(delegate_->calls.contains("didEnd"));
     ASSERT_TRUE(QFile::rename(partial, hostPath_));
-    ASSERT_TRUE(waitUntil([&] { return !services_.client->uploads.isEmpty(); }));
-}
-
-TEST_F(AgentTest, AnExportThatNeverFinishesFailsPublishingCleanly) {
-    services_.signIn->signedIn = true;
-    show();
-    form()->titleCell()->setValue(QStringLiteral("Run"));
-    agent_->mediaWaiter()->setStallTimeout(300);
-    publish();
-    ASSERT_TRUE(waitUntil([&] { return delegate_->calls.contains("didEnd"); }, 5000));
-    EXPECT_TRUE(PublishingError::is(delegate_->endError, PublishingError::MediaNotReady));
-    EXPECT_TRUE(services_.client->uploads.isEmpty());
-    EXPECT_TRUE(agent_->mediaURL().isEmpty());
-}
-
-TEST_F(AgentTest, AFailedUploadEndsWithItsErrorShownInTheForm) {
-    services_.signIn->signedIn = true;
-    writeFile(hostPath_, 10);
-    show();
-    form()->titleCell()->setValue(QStringLiteral("Run"));
-    publish();
-    ASSERT_TRUE(waitUntil([&] { return !services_.client->uploads.isEmpty(); }));
-    services_.client->fail(PublishingError::QuotaExceeded, QStringLiteral("quota is used up"));
-    EXPECT_TRUE(PublishingError::is(delegate_->endError, PublishingError::QuotaExceeded));
-    EXPECT_TRUE(form()->statusText().contains(QStringLiteral("quota is used up")));
-    EXPECT_TRUE(agent_->mediaURL().isEmpty());
-    EXPECT_EQ(delegate_->calls.count("didEnd"), 1);
+    ASSERT_TRUE(uploaded());
 }
 
 TEST_F(AgentTest, TitleAndDescriptionAreMadeFitAndTheFormSaysWhatChanged) {
-    services_.signIn->signedIn = true;
-    writeFile(hostPath_, 10);
-    show();
-    form()->titleCell()->setValue(QStringLiteral("<b>") + QString(120, QLatin1Char('x')));
+    signIn_->signedIn = true;
+    show(QStringLiteral("<b>") + QString(120, QLatin1Char('x')));
     EXPECT_TRUE(form()->adjustmentNotice().contains(QStringLiteral("will be shortened")));
     publish();
-    ASSERT_TRUE(waitUntil([&] { return !services_.client->uploads.isEmpty(); }));
-    const QString sent = services_.client->uploads.first().title;
+    ASSERT_TRUE(uploaded());
+    const QString sent = client_->uploads.first().title;
     EXPECT_EQ(sent.size(), 100);
     EXPECT_TRUE(sent.startsWith(QStringLiteral("‹b›")));
     EXPECT_EQ(form()->titleCell()->value(), sent) << "the field shows what was sent";
@@ -230,9 +212,10 @@ TEST_F(AgentTest, TitleAndDescriptionAreMadeFitAndTheFormSaysWhatChanged) {
 
 // Categories arrive twice, built-in then the service's; the operation runs
 // each time, through the method table, so an activity's version takes over.
-TEST_F(AgentTest, CategoriesArriveBuiltInThenFromTheServiceAndRunTheReplaceableOperation) {
-    services_.signIn->signedIn = true;
-    services_.client->categories = {{"10", "Music"}, {"20", "Gaming"}, {"22", "People & Blogs"}};
+// The form's own keeps the choice made so far.
+TEST_F(AgentTest, CategoriesArriveTwiceAndRunTheReplaceablePreselection) {
+    signIn_->signedIn = true;
+    client_->categories = {{"10", "Music"}, {"20", "Gaming"}, {"22", "People & Blogs"}};
     const QByteArray operation = YouTubeUploadForm::selectCategoryOperation();
     int runs = 0;
     platform::MethodTable::addMethod(&Preselector::staticMetaObject, operation,
@@ -250,24 +233,16 @@ TEST_F(AgentTest, CategoriesArriveBuiltInThenFromTheServiceAndRunTheReplaceableO
     EXPECT_EQ(form()->property("_picker").value<QObject*>()->property("selectedRow").toInt(), 1);
     ASSERT_TRUE(platform::MethodTable::exchangeImplementations(
         &YouTubeUploadForm::staticMetaObject, &Preselector::staticMetaObject, operation));
-}
 
-TEST_F(AgentTest, TheFormsOwnPreselectionKeepsTheChoiceMadeSoFar) {
-    services_.signIn->signedIn = true;
-    services_.client->categories = {{"10", "Music"}, {"22", "People & Blogs"}, {"23", "Comedy"}};
-    show();
-    ASSERT_TRUE(waitUntil([&] { return form()->categories().size() == 3; }));
-    EXPECT_EQ(form()->defaultCategory(), "22");
     auto* picker = qobject_cast<youtube_publishing::CategoryPicker*>(form()->picker());
-    picker->setCurrentIndex(2); // the user picks Comedy
-    EXPECT_EQ(form()->defaultCategory(), "23");
-    form()->setCategories({{"23", "Comedy"}, {"24", "Entertainment"}});
-    EXPECT_EQ(form()->defaultCategory(), "23");
-    EXPECT_EQ(picker->currentText(), "Comedy");
+    picker->setCurrentIndex(2); // the user picks People & Blogs
+    form()->setCategories({{"22", "People & Blogs"}, {"24", "Entertainment"}});
+    EXPECT_EQ(form()->defaultCategory(), "22");
+    EXPECT_EQ(picker->currentText(), "People & Blogs");
 }
 
 TEST_F(AgentTest, WithoutAnOAuthClientTheAccountRowSaysPublishingIsNotSetUp) {
-    services_.signIn->configured = false;
+    signIn_->configured = false;
     show();
     EXPECT_EQ(form()->accountCell()->state(),
               youtube_publishing::FormAccountCell::State::Unavailable);

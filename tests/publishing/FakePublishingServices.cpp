@@ -9,11 +9,14 @@ namespace testing_support {
 using platform::MainQueue::async;
 namespace PublishingError = platform::PublishingError;
 
+namespace {
+platform::ErrorPtr notSignedIn() {
+    return PublishingError::make(PublishingError::NotSignedIn, QStringLiteral("not signed in"));
+}
+} // namespace
+
 void FakeSignIn::restore(Handler handler) {
-    async([this, handler] {
-        handler(signedIn ? nullptr
-                         : PublishingError::make(PublishingError::NotSignedIn, "not signed in"));
-    });
+    async([this, handler] { handler(signedIn ? nullptr : notSignedIn()); });
 }
 
 void FakeSignIn::signIn(Handler handler) {
@@ -29,21 +32,12 @@ void FakeSignIn::signIn(Handler handler) {
 
 void FakeSignIn::accessToken(bool, TokenHandler handler) {
     async([this, handler] {
-        if (signedIn)
-            handler(QStringLiteral("token"), nullptr);
-        else
-            handler(QString(),
-                    PublishingError::make(PublishingError::NotSignedIn, "not signed in"));
+        handler(signedIn ? QStringLiteral("token") : QString(), signedIn ? nullptr : notSignedIn());
     });
 }
 
-void FakeSignIn::signOut() {
-    signedIn = false;
-    emit signedInChanged(false);
-}
-
 void FakeUploadClient::fetchCategories(const QString&, const QString&, CategoriesHandler handler) {
-    async([this, handler] { handler(categories, categoriesError); });
+    async([this, handler] { handler(categories, nullptr); });
 }
 
 void FakeUploadClient::upload(const platform::YouTubeUpload& upload, ProgressHandler progress,
@@ -54,21 +48,13 @@ void FakeUploadClient::upload(const platform::YouTubeUpload& upload, ProgressHan
 }
 
 void FakeUploadClient::succeed(const QString& videoId) {
-    if (progress)
-        progress(100, 100);
-    auto handler = std::exchange(done, nullptr);
-    handler({videoId, QUrl(QStringLiteral("https://www.youtube.com/watch?v=") + videoId)}, nullptr);
+    progress(100, 100);
+    std::exchange(done, nullptr)(
+        {videoId, QUrl(QStringLiteral("https://www.youtube.com/watch?v=") + videoId)}, nullptr);
 }
 
 void FakeUploadClient::fail(PublishingError::Code code, const QString& message) {
-    auto handler = std::exchange(done, nullptr);
-    handler({}, PublishingError::make(code, message));
+    std::exchange(done, nullptr)({}, PublishingError::make(code, message));
 }
-
-ScopedFakeServices::ScopedFakeServices()
-    : signInMaker_(platform::YouTubeSignIn::implementation().replace(
-          [this] { return std::static_pointer_cast<platform::YouTubeSignIn>(signIn); })),
-      clientMaker_(platform::YouTubeUploadClient::implementation().replace(
-          [this] { return std::static_pointer_cast<platform::YouTubeUploadClient>(client); })) {}
 
 } // namespace testing_support

@@ -1,15 +1,12 @@
 // Runs only inside with-keyring.sh: a private session bus with an unlocked
 // GNOME keyring.
-#include "FakeBrowser.h"
-#include "FakeYouTubeServer.h"
 #include "RefreshTokenStore.h"
+#include "ServerFixture.h"
+#include "ShareFakes.h"
 #include "YouTubeGoogleSignIn.h"
 #include "support/LogCapture.h"
-#include "support/TempDir.h"
 #include "support/Wait.h"
 
-#include <QTemporaryDir>
-#include <gtest/gtest.h>
 #include <qt6keychain/keychain.h>
 
 #include <optional>
@@ -36,31 +33,28 @@ std::optional<QString> storedToken() {
     return job.textData();
 }
 
+// The fixture's server with the session bus that with-keyring.sh started.
+class Keyring : public ServerFixture {
+    void SetUp() override {
+        const QByteArray bus = qgetenv("DBUS_SESSION_BUS_ADDRESS");
+        ServerFixture::SetUp();
+        env_.set("DBUS_SESSION_BUS_ADDRESS", bus);
+    }
+};
+
 } // namespace
 
-TEST(Keyring, TheRefreshTokenLivesInTheSecretStoreAcrossSessionsAndGoesWithSignOut) {
+TEST_F(Keyring, TheRefreshTokenLivesInTheSecretStoreAcrossSessionsAndGoesWithSignOut) {
     ASSERT_TRUE(qEnvironmentVariableIsSet("TAMSEL_TEST_KEYRING"))
         << "run through tests/publishing/with-keyring.sh";
-    QTemporaryDir storage;
-    FakeYouTubeServer server(storage.path());
-    ASSERT_TRUE(server.start());
-    ScopedEnv env;
-    for (const QString& line : server.environment()) {
-        const qsizetype equals = line.indexOf(QLatin1Char('='));
-        env.set(line.left(equals).toLatin1().constData(), line.mid(equals + 1).toUtf8());
-    }
     LogCapture log;
-    ScopedBrowser browser;
-
+    FakeBrowser browser(FakeBrowser::Behaviour::Follow);
     {
         YouTubeGoogleSignIn google;
-        std::optional<platform::ErrorPtr> result;
-        google.signIn([&](platform::ErrorPtr error) { result = error; });
-        ASSERT_TRUE(waitUntil([&] { return result.has_value(); }, 30000));
-        ASSERT_EQ(*result, nullptr) << (*result)->description().toStdString();
+        ASSERT_EQ(awaited<platform::ErrorPtr>([&](auto done) { google.signIn(done); }, 30000),
+                  std::optional<platform::ErrorPtr>(nullptr));
     }
-    ASSERT_EQ(server.issuedRefreshTokens().size(), 1);
-    const QString issued = server.issuedRefreshTokens().first();
+    const QString issued = server_.record().refreshTokens.value(0);
     std::optional<QString> stored;
     ASSERT_TRUE(waitUntil([&] { return (stored = storedToken()) && *stored == issued; }, 10000))
         << "in the keyring: " << stored.value_or(QStringLiteral("(no answer)")).toStdString();
@@ -70,18 +64,15 @@ TEST(Keyring, TheRefreshTokenLivesInTheSecretStoreAcrossSessionsAndGoesWithSignO
     // A later session of the editor: nothing in memory, the keyring has it.
     RefreshTokenStore::shared().reset();
     YouTubeGoogleSignIn later;
-    std::optional<platform::ErrorPtr> restored;
-    later.restore([&](platform::ErrorPtr error) { restored = error; });
-    ASSERT_TRUE(waitUntil([&] { return restored.has_value(); }, 10000));
-    EXPECT_EQ(*restored, nullptr);
-    EXPECT_TRUE(later.isSignedIn());
-    std::optional<std::pair<QString, platform::ErrorPtr>> token;
-    later.accessToken(true, [&](const QString& t, platform::ErrorPtr e) { token = {t, e}; });
-    ASSERT_TRUE(waitUntil([&] { return token.has_value(); }));
-    EXPECT_EQ(token->second, nullptr);
-    EXPECT_EQ(server.counters().refreshes, 1) << "refreshed with the token from the keyring";
+    EXPECT_EQ(awaited<platform::ErrorPtr>([&](auto done) { later.restore(done); }),
+              std::optional<platform::ErrorPtr>(nullptr));
+    EXPECT_EQ(awaited<platform::ErrorPtr>([&](auto done) {
+                  later.accessToken(true, [done](const QString&, auto e) { done(e); });
+              }),
+              std::optional<platform::ErrorPtr>(nullptr));
+    EXPECT_EQ(server_.record().refreshes, 1) << "refreshed with the token from the keyring";
 
     later.signOut();
     EXPECT_TRUE(waitUntil([&] { return storedToken() == QString(); }, 10000));
-    EXPECT_EQ(browser.browser().opened().size(), 1);
+    EXPECT_EQ(browser.opened().size(), 1);
 }

@@ -7,15 +7,10 @@
 
 namespace testing_support {
 
-ServerFixture::ServerFixture() : server_(storage_.path()) {}
-
 void ServerFixture::SetUp() {
-    ASSERT_TRUE(storage_.isValid());
     ASSERT_TRUE(server_.start());
-    for (const QString& line : server_.environment()) {
-        const qsizetype equals = line.indexOf(QLatin1Char('='));
-        env_.set(line.left(equals).toLatin1().constData(), line.mid(equals + 1).toUtf8());
-    }
+    for (const QString& line : server_.environment())
+        env_.set(line.section('=', 0, 0).toLatin1().constData(), line.section('=', 1).toUtf8());
     env_.set("DBUS_SESSION_BUS_ADDRESS", "unix:path=/nonexistent/tamsel-test-bus");
     env_.unset("DISPLAY");
     youtube_publishing::RefreshTokenStore::shared().reset();

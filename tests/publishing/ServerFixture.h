@@ -1,6 +1,5 @@
 #pragma once
 
-#include "FakeBrowser.h"
 #include "FakeYouTubeServer.h"
 #include "support/TempDir.h"
 
@@ -19,14 +18,13 @@ namespace testing_support {
 // memory. Each test starts signed out.
 class ServerFixture : public ::testing::Test {
   protected:
-    ServerFixture();
+    ServerFixture() : server_(storage_.path()) {}
     void SetUp() override;
     void TearDown() override;
 
     // A sign-in of the plug-in (the real one).
     std::shared_ptr<platform::YouTubeSignIn> makeSignIn();
-    // Signs in without the browser: the account's refresh token is one the
-    // server knows.
+    // Signs in without the browser, with a refresh token the server knows.
     void signInQuietly();
 
     QTemporaryDir storage_;

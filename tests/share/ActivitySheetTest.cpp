@@ -12,6 +12,7 @@
 #include "support/Wait.h"
 #include "ui/UiInput.h"
 
+#include <QLabel>
 #include <QListWidget>
 #include <gtest/gtest.h>
 
@@ -20,12 +21,6 @@ using testing_support::FakeActivity;
 using testing_support::waitUntil;
 
 namespace {
-
-struct Report {
-    int calls = 0;
-    QString type;
-    bool completed = false;
-};
 
 class ActivitySheetTest : public ::testing::Test {
   protected:
@@ -40,32 +35,30 @@ class ActivitySheetTest : public ::testing::Test {
     void TearDown() override { MainQueue::runPending(); }
 
     std::shared_ptr<FakeActivity> builtIn(const QString& type, bool canPerform = true) {
-        auto activity = std::make_shared<FakeActivity>(type, type.section('.', -1), canPerform);
-        builtIns.append(activity);
-        return activity;
+        builtIns.append(std::make_shared<FakeActivity>(type, type.section('.', -1), canPerform));
+        return std::static_pointer_cast<FakeActivity>(builtIns.last());
     }
 
-    std::shared_ptr<ActivitySheet> sheetWith(const QList<std::shared_ptr<Activity>>& apps = {}) {
+    // A sheet on the items, presented in `style` (unless None) and reporting
+    // to `calls`, `type` and `completed`.
+    std::shared_ptr<ActivitySheet>
+    sheetWith(const QList<std::shared_ptr<Activity>>& apps = {},
+              std::optional<ViewController::ModalPresentationStyle> style =
+                  ViewController::ModalPresentationStyle::FullScreen) {
         auto sheet = ActivitySheet::make(items, apps);
         sheet->setCompletionWithItemsHandler(
-            [this](const QString& type, bool completed, const QVariantList&, ErrorPtr) {
-                ++report.calls;
-                report.type = type;
-                report.completed = completed;
+            [this](const QString& t, bool c, const QVariantList&, ErrorPtr) {
+                ++calls;
+                type = t;
+                completed = c;
             });
+        if (style) {
+            waitUntil([&] { return !root->presentedViewController(); });
+            sheet->setModalPresentationStyle(*style);
+            root->presentViewController_animated_completion(sheet, false);
+            waitUntil([&] { return sheet->appearance() == ViewController::Appearance::Appeared; });
+        }
         return sheet;
-    }
-
-    void present(const std::shared_ptr<ActivitySheet>& sheet) {
-        root->presentViewController_animated_completion(sheet, false);
-        waitUntil([&] { return sheet->appearance() == ViewController::Appearance::Appeared; });
-    }
-
-    static QStringList typesOf(const ActivityViewController::ActivityList& activities) {
-        QStringList types;
-        for (const auto& activity : activities)
-            types.append(activity->activityType());
-        return types;
     }
 
     static QStringList rowsOf(ActivitySheet& sheet) {
@@ -82,7 +75,9 @@ class ActivitySheetTest : public ::testing::Test {
         SystemActivities::implementation().replace([this] { return builtIns; });
     QVariantList items{QStringLiteral("Look at this"), QUrl("https://store.example/apps/x"),
                        QUrl::fromLocalFile("/tmp/recording.mp4")};
-    Report report;
+    int calls = 0;
+    QString type;
+    bool completed = false;
 };
 
 } // namespace
@@ -94,9 +89,14 @@ TEST_F(ActivitySheetTest, OffersWhatCanPerformInThePreferredOrderWithoutExcluded
     builtIn(PostToFacebookActivityType, false);
     builtIn(SaveToFilesActivityType);
     auto youTube = std::make_shared<FakeActivity>("TXPublishToYouTube", "YouTube");
-    auto sheet = sheetWith({youTube});
-
-    EXPECT_EQ(typesOf(sheet->offeredActivities()),
+    auto sheet = sheetWith({youTube}, std::nullopt);
+    const auto offered = [&] {
+        QStringList types;
+        for (const auto& activity : sheet->offeredActivities())
+            types.append(activity->activityType());
+        return types;
+    };
+    EXPECT_EQ(offered(),
               (QStringList{MailActivityType, MessageActivityType, CopyToPasteboardActivityType,
                            SaveToFilesActivityType, "TXPublishToYouTube"}))
         << "the sheet's own order, application activities last";
@@ -104,101 +104,75 @@ TEST_F(ActivitySheetTest, OffersWhatCanPerformInThePreferredOrderWithoutExcluded
     sheet->setExcludedActivityTypes({CopyToPasteboardActivityType});
     sheet->setPreferredActivityOrder({MailActivityType, MessageActivityType, "TXPublishToYouTube",
                                       CopyToPasteboardActivityType, PostToFacebookActivityType});
-    EXPECT_EQ(typesOf(sheet->offeredActivities()),
-              (QStringList{MailActivityType, MessageActivityType, "TXPublishToYouTube",
-                           SaveToFilesActivityType}))
+    EXPECT_EQ(offered(), (QStringList{MailActivityType, MessageActivityType, "TXPublishToYouTube",
+                                      SaveToFilesActivityType}))
         << "preferred first and in that order; excluded although preferred; Facebook cannot";
-    EXPECT_EQ(youTube->lastAskedItems, items) << "canPerform is asked with the sheet's items";
+    EXPECT_EQ(youTube->askedItems, items) << "canPerform is asked with the sheet's items";
 
     sheet->setModalPresentationStyle(ViewController::ModalPresentationStyle::FullScreen);
-    present(sheet);
-    EXPECT_EQ(rowsOf(*sheet), typesOf(sheet->offeredActivities()));
+    root->presentViewController_animated_completion(sheet, false);
+    ASSERT_TRUE(waitUntil([&] { return rowsOf(*sheet) == offered(); }));
     EXPECT_EQ(sheet->activityList()->item(2)->text(), "YouTube");
 }
 
-TEST_F(ActivitySheetTest, AnActivityThatLearnsLateJoinsTheList) {
+TEST_F(ActivitySheetTest, AnActivityThatLearnsLateJoinsTheListAndNothingToOfferIsSaid) {
     builtIn(MailActivityType);
     auto late = builtIn(MessageActivityType, false);
     auto sheet = sheetWith();
-    present(sheet);
     EXPECT_EQ(rowsOf(*sheet), QStringList{MailActivityType});
-    late->becomeAvailable(true);
+    late->canPerform = true;
+    emit late->availabilityChanged();
     EXPECT_EQ(rowsOf(*sheet), (QStringList{MailActivityType, MessageActivityType}));
     EXPECT_EQ(sheet->activityList()->currentRow(), 0) << "the untouched choice stays at the top";
+    sheet->cancel();
+    ASSERT_TRUE(waitUntil([&] { return calls == 1; }));
+
+    builtIns = {};
+    builtIn(MailActivityType, false);
+    sheet = sheetWith();
+    EXPECT_EQ(sheet->activityList()->count(), 0);
+    auto* empty = sheet->view()->findChild<QLabel*>("shareEmpty");
+    ASSERT_TRUE(empty);
+    EXPECT_TRUE(empty->isVisible());
 }
 
-TEST_F(ActivitySheetTest, AClickPreparesPerformsAndReportsTheCompletedType) {
+TEST_F(ActivitySheetTest, AClickRunsTheActivityAndItsEndIsReportedOnce) {
     builtIn(MailActivityType);
     auto message = builtIn(MessageActivityType);
+    message->completesWith.reset();
     auto sheet = sheetWith();
-    present(sheet);
     QListWidget* list = sheet->activityList();
     ui_input::tap(list->viewport(), QRectF(list->visualItemRect(list->item(1))).center());
-
-    ASSERT_TRUE(waitUntil([&] { return report.calls > 0; }));
+    ASSERT_TRUE(waitUntil([&] { return message->calls.contains("perform"); }));
     EXPECT_EQ(message->calls, (QStringList{"prepare", "activityViewController", "perform"}));
-    EXPECT_EQ(message->preparedItems, items);
-    EXPECT_EQ(report.type, MessageActivityType);
-    EXPECT_TRUE(report.completed);
+    EXPECT_EQ(message->askedItems, items);
     EXPECT_EQ(root->presentedViewController(), nullptr) << "the sheet made way";
-    waitUntil([] { return false; }, 50);
-    EXPECT_EQ(report.calls, 1);
-}
-
-TEST_F(ActivitySheetTest, AFailedActivityIsReportedNotCompleted) {
-    auto mail = builtIn(MailActivityType);
-    mail->completesWith.reset();
-    auto sheet = sheetWith();
-    present(sheet);
-    ASSERT_TRUE(sheet->performActivityNamed("Mail")) << "found by its title too";
-    ASSERT_TRUE(waitUntil([&] { return mail->calls.contains("perform"); }));
-    EXPECT_EQ(report.calls, 0) << "nothing is reported while the activity works";
-    mail->activityDidFinish(false);
-    mail->activityDidFinish(true);
-    EXPECT_EQ(report.calls, 1);
-    EXPECT_EQ(report.type, MailActivityType);
-    EXPECT_FALSE(report.completed);
-}
-
-TEST_F(ActivitySheetTest, AnActivitysControllerIsPresentedAndDismissedWhenItFinishes) {
-    auto youTube = std::make_shared<FakeActivity>("TXPublishToYouTube", "YouTube");
-    youTube->controller = std::make_shared<ViewController>();
-    auto sheet = sheetWith({youTube});
-    present(sheet);
-    ASSERT_TRUE(sheet->performActivityNamed("TXPublishToYouTube"));
-    ASSERT_TRUE(
-        waitUntil([&] { return root->presentedViewController() == youTube->controller.get(); }));
-    EXPECT_FALSE(youTube->calls.contains("perform"));
-    youTube->activityDidFinish(true);
-    ASSERT_TRUE(waitUntil([&] { return root->presentedViewController() == nullptr; }));
-    EXPECT_EQ(report.type, "TXPublishToYouTube");
-    EXPECT_TRUE(report.completed);
+    EXPECT_EQ(calls, 0) << "nothing is reported while the activity works";
+    message->activityDidFinish(false);
+    message->activityDidFinish(true);
+    EXPECT_EQ(calls, 1);
+    EXPECT_EQ(type, MessageActivityType);
+    EXPECT_FALSE(completed) << "failed, so not completed";
 }
 
 TEST_F(ActivitySheetTest, TheKeyboardReachesEveryRowAndEscapeCancels) {
     builtIn(MailActivityType);
     auto save = builtIn(SaveToFilesActivityType);
-    {
-        auto sheet = sheetWith();
-        sheet->setModalPresentationStyle(ViewController::ModalPresentationStyle::FullScreen);
-        present(sheet);
-        QListWidget* list = sheet->activityList();
-        EXPECT_TRUE(list->hasFocus());
-        ui_input::key(list, Qt::Key_Down);
-        ui_input::key(list, Qt::Key_Return);
-        ASSERT_TRUE(waitUntil([&] { return report.calls > 0; }));
-        EXPECT_EQ(report.type, SaveToFilesActivityType);
-        EXPECT_TRUE(save->calls.contains("perform"));
-    }
-    report = {};
     auto sheet = sheetWith();
-    present(sheet);
+    EXPECT_TRUE(sheet->activityList()->hasFocus());
+    ui_input::key(sheet->activityList(), Qt::Key_Down);
+    ui_input::key(sheet->activityList(), Qt::Key_Return);
+    ASSERT_TRUE(waitUntil([&] { return calls > 0; }));
+    EXPECT_EQ(type, SaveToFilesActivityType);
+    EXPECT_TRUE(save->calls.contains("perform"));
+
+    calls = 0;
+    sheet = sheetWith();
     ui_input::key(sheet->activityList(), Qt::Key_Escape);
-    ASSERT_TRUE(waitUntil([&] { return report.calls > 0; }));
-    EXPECT_TRUE(report.type.isNull());
-    EXPECT_FALSE(report.completed);
-    ASSERT_TRUE(waitUntil([&] { return root->presentedViewController() == nullptr; }));
-    EXPECT_EQ(report.calls, 1);
+    ASSERT_TRUE(waitUntil([&] { return calls > 0; }));
+    EXPECT_EQ(root->presentedViewController(), nullptr);
+    EXPECT_TRUE(type.isNull());
+    EXPECT_FALSE(completed);
 }
 
 TEST_F(ActivitySheetTest, APopoverStandsByItsItemAndAPressBesideItCancels) {
@@ -210,31 +184,20 @@ TEST_F(ActivitySheetTest, APopoverStandsByItsItemAndAPressBesideItCancels) {
     bar->show();
     waitUntil([] { return false; }, 50);
 
-    auto sheet = sheetWith();
-    sheet->setModalPresentationStyle(ViewController::ModalPresentationStyle::Popover);
+    auto sheet = sheetWith({}, std::nullopt);
     sheet->setPopoverItem(share);
-    present(sheet);
+    sheet->setModalPresentationStyle(ViewController::ModalPresentationStyle::Popover);
+    root->presentViewController_animated_completion(sheet, false);
+    waitUntil([&] { return sheet->appearance() == ViewController::Appearance::Appeared; });
     QWidget* anchor = bar->widgetForItem(share.get());
     ASSERT_TRUE(anchor);
-    const QRect panel = sheet->view()->geometry();
-    EXPECT_LT(panel.width(), 400) << "a panel, not the whole window";
+    EXPECT_LT(sheet->view()->geometry().width(), 400) << "a panel, not the whole window";
     EXPECT_GE(sheet->view()->mapTo(&window, QPoint(0, 0)).y(),
               anchor->mapTo(&window, QPoint(0, anchor->height())).y() - 1)
         << "below the share item";
 
-    QWidget* container = sheet->view()->parentWidget();
-    ui_input::tap(container, QPointF(20, 300));
-    ASSERT_TRUE(waitUntil([&] { return report.calls > 0; }));
-    EXPECT_FALSE(report.completed);
-    EXPECT_TRUE(report.type.isNull());
-}
-
-TEST_F(ActivitySheetTest, WithNothingToOfferItSaysSo) {
-    builtIn(MailActivityType, false);
-    auto sheet = sheetWith();
-    present(sheet);
-    EXPECT_EQ(sheet->activityList()->count(), 0);
-    auto* empty = sheet->view()->findChild<QLabel*>("shareEmpty");
-    ASSERT_TRUE(empty);
-    EXPECT_TRUE(empty->isVisible());
+    ui_input::tap(sheet->view()->parentWidget(), QPointF(20, 300));
+    ASSERT_TRUE(waitUntil([&] { return calls > 0; }));
+    EXPECT_FALSE(completed);
+    EXPECT_TRUE(type.isNull());
 }

@@ -2,7 +2,7 @@
 // and the file manager's ShowItems, against fakes of those services on a
 // private session bus.
 
-#include "PrivateSessionBus.h"
+#include "ShareFakes.h"
 #include "platform/ui/share/DBusFileManager.h"
 #include "platform/ui/share/PortalMailComposer.h"
 #include "support/Wait.h"
@@ -14,13 +14,15 @@
 #include <QDBusObjectPath>
 #include <QDBusUnixFileDescriptor>
 #include <QFile>
+#include <QProcess>
+#include <QStandardPaths>
 #include <QTemporaryDir>
 #include <QTimer>
 #include <gtest/gtest.h>
 #include <unistd.h>
 
 using namespace platform;
-using testing_support::waitUntil;
+using namespace testing_support;
 
 namespace {
 
@@ -74,79 +76,80 @@ class FakeFileManager1 : public QObject {
     void ShowItems(const QStringList& uris, const QString&) { shown += uris; }
 };
 
+// A D-Bus session bus of the test's own, so the fakes own their names on it
+// without touching the user's session; skipped without dbus-daemon.
 class DesktopServicesTest : public ::testing::Test {
   protected:
     void SetUp() override {
-        if (!bus.isRunning())
+        const QString program = QStandardPaths::findExecutable("dbus-daemon");
+        if (program.isEmpty())
             GTEST_SKIP() << "dbus-daemon is not installed";
+        daemon.start(program, {"--session", "--nofork", "--print-address"});
+        ASSERT_TRUE(daemon.waitForStarted(5000));
+        while (!daemon.canReadLine() && daemon.waitForReadyRead(5000)) {
+        }
+        address = QString::fromUtf8(daemon.readLine()).trimmed();
+        ASSERT_FALSE(address.isEmpty());
         qDBusRegisterMetaType<QList<QDBusUnixFileDescriptor>>();
     }
-    testing_support::PrivateSessionBus bus;
+    void TearDown() override {
+        for (const char* name : {"service", "client"})
+            QDBusConnection::disconnectFromBus(name);
+        daemon.terminate();
+        daemon.waitForFinished(3000);
+    }
+    QDBusConnection connect(const char* name) {
+        return QDBusConnection::connectToBus(address, name);
+    }
+    QProcess daemon;
+    QString address;
 };
 
 } // namespace
 
 TEST_F(DesktopServicesTest, ThePortalGetsTheBodyAndTheAttachmentsAsDescriptors) {
-    QDBusConnection service = bus.connect("portal-service");
-    QDBusConnection client = bus.connect("portal-client");
-    PortalMailComposer composer(client);
-
-    std::optional<bool> available;
-    composer.checkAvailability([&](bool a) { available = a; });
-    ASSERT_TRUE(waitUntil([&] { return available.has_value(); }));
-    EXPECT_FALSE(*available) << "no portal on the bus yet";
-
+    QDBusConnection service = connect("service");
+    PortalMailComposer composer(connect("client"));
+    const auto available = [&] {
+        return awaited<bool>([&](auto done) { composer.checkAvailability(done); });
+    };
+    EXPECT_EQ(available(), false) << "no portal on the bus yet";
     FakeEmailPortal portal(service);
     ASSERT_TRUE(service.registerObject("/org/freedesktop/portal/desktop", &portal,
                                        QDBusConnection::ExportAllSlots |
                                            QDBusConnection::ExportAllProperties));
     ASSERT_TRUE(service.registerService("org.freedesktop.portal.Desktop"));
-    available.reset();
-    composer.checkAvailability([&](bool a) { available = a; });
-    ASSERT_TRUE(waitUntil([&] { return available.has_value(); }));
-    EXPECT_TRUE(*available);
+    EXPECT_EQ(available(), true);
 
     QTemporaryDir dir;
-    QFile movie(dir.filePath("clip.mp4"));
-    ASSERT_TRUE(movie.open(QIODevice::WriteOnly));
-    movie.write("not really a movie");
-    movie.close();
+    writeText(dir.filePath("clip.mp4"), "not really a movie");
     MailDraft draft;
     draft.body = "Check out my recording of Racer by Example Games!";
-    draft.attachments = {QUrl::fromLocalFile(movie.fileName())};
-    std::optional<bool> handedOver;
-    composer.compose(draft, [&](bool ok) { handedOver = ok; });
-    ASSERT_TRUE(waitUntil([&] { return handedOver.has_value(); }));
-    EXPECT_TRUE(*handedOver);
+    draft.attachments = {QUrl::fromLocalFile(dir.filePath("clip.mp4"))};
+    const auto compose = [&] {
+        return awaited<bool>([&](auto done) { composer.compose(draft, done); });
+    };
+    EXPECT_EQ(compose(), true);
     EXPECT_EQ(portal.options.value("body").toString(), draft.body);
     EXPECT_EQ(portal.attachments, QList<QByteArray>{"not really a movie"});
-
     portal.answer = 1; // the user closed the chooser
-    handedOver.reset();
-    composer.compose(draft, [&](bool ok) { handedOver = ok; });
-    ASSERT_TRUE(waitUntil([&] { return handedOver.has_value(); }));
-    EXPECT_FALSE(*handedOver);
+    EXPECT_EQ(compose(), false);
 }
 
 TEST_F(DesktopServicesTest, ShowItemsReachesTheFileManagerAndFailsWithoutOne) {
-    QDBusConnection service = bus.connect("files-service");
-    QDBusConnection client = bus.connect("files-client");
-    DBusFileManager files(client);
-    const QUrl movie = QUrl::fromLocalFile("/tmp/with space/Racer.mp4");
-
-    std::optional<bool> shown;
-    files.showItems({movie}, [&](bool ok) { shown = ok; });
-    ASSERT_TRUE(waitUntil([&] { return shown.has_value(); }));
-    EXPECT_FALSE(*shown) << "no file manager on the bus";
-
+    QDBusConnection service = connect("service");
+    DBusFileManager files(connect("client"));
+    const auto show = [&] {
+        return awaited<bool>([&](auto done) {
+            files.showItems({QUrl::fromLocalFile("/tmp/with space/Racer.mp4")}, done);
+        });
+    };
+    EXPECT_EQ(show(), false) << "no file manager on the bus";
     FakeFileManager1 manager;
     ASSERT_TRUE(service.registerObject("/org/freedesktop/FileManager1", &manager,
                                        QDBusConnection::ExportAllSlots));
     ASSERT_TRUE(service.registerService("org.freedesktop.FileManager1"));
-    shown.reset();
-    files.showItems({movie}, [&](bool ok) { shown = ok; });
-    ASSERT_TRUE(waitUntil([&] { return shown.has_value(); }));
-    EXPECT_TRUE(*shown);
+    EXPECT_EQ(show(), true);
     EXPECT_EQ(manager.shown, QStringList{"file:///tmp/with%20space/Racer.mp4"});
 }
 

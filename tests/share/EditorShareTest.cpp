@@ -11,7 +11,7 @@
 #include "youtube/TXYouTubeActivity.h"
 
 using namespace platform;
-using testing_support::waitUntil;
+using namespace testing_support;
 
 namespace {
 
@@ -19,8 +19,8 @@ class EditorShareTest : public EditorOnFakes {
   protected:
     void SetUp() override {
         EditorOnFakes::SetUp();
-        store->response.results = {testing_support::storeItem(
-            "Racer", "Example Games", "https://store.example/apps/org.example.Racer")};
+        store->response.results = {
+            storeItem("Racer", "Example Games", "https://store.example/apps/org.example.Racer")};
     }
     void TearDown() override {
         if (editor && editor->presentedViewController())
@@ -30,8 +30,7 @@ class EditorShareTest : public EditorOnFakes {
         EditorOnFakes::TearDown();
     }
 
-    // Makes the editor, shows it in a window of `size`, and waits until it
-    // is on screen.
+    // Makes the editor and waits until it is on screen in a window of `size`.
     void show(QSize size = QSize(900, 600)) {
         makeEditor();
         window = std::make_unique<Window>();
@@ -42,89 +41,52 @@ class EditorShareTest : public EditorOnFakes {
             [&] { return editor->appearance() == ViewController::Appearance::Appeared; }));
     }
 
-    // Taps share and waits for the sheet.
-    std::shared_ptr<testing_support::FakeActivitySheet> share() {
-        const auto before = testing_support::FakeActivitySheet::made().size();
+    // Taps share and waits for the sheet; the sheet before it ends first, as
+    // `finishing` says (a null type cancels).
+    std::shared_ptr<FakeActivitySheet> share(const QString& finishing = QString(),
+                                             bool completed = false) {
+        if (!sheets.made.isEmpty())
+            sheets.made.last()->finish(finishing, completed);
+        const auto before = sheets.made.size();
         editor->shareAction();
         waitUntil([&] {
-            return testing_support::FakeActivitySheet::made().size() > before &&
-                   editor->presentedViewController() == sheets.last().get();
+            return sheets.made.size() > before &&
+                   editor->presentedViewController() == sheets.made.last().get();
         });
-        return testing_support::FakeActivitySheet::made().size() > before ? sheets.last() : nullptr;
+        return sheets.made.size() > before ? sheets.made.last() : nullptr;
     }
 
-    testing_support::ScopedEnv language{"LANGUAGE", "en"};
-    testing_support::ScopedEnv locale{"LC_ALL", "en_US.UTF-8"};
-    std::shared_ptr<testing_support::FakeStoreLookup> store =
-        std::make_shared<testing_support::FakeStoreLookup>();
-    std::shared_ptr<testing_support::FakeExtensionRegistry> extensions =
-        std::make_shared<testing_support::FakeExtensionRegistry>();
-    std::shared_ptr<testing_support::FakePublishingSupport> publishing =
-        std::make_shared<testing_support::FakePublishingSupport>();
-    Implementation<StoreLookup::Maker>::Replacement r1 =
-        StoreLookup::implementation().replace([this] { return store; });
-    Implementation<ExtensionRegistry::Maker>::Replacement r2 =
-        ExtensionRegistry::implementation().replace([this] { return extensions; });
-    Implementation<PublishingSupport::Maker>::Replacement r3 =
-        PublishingSupport::implementation().replace([this] { return publishing; });
-    testing_support::FakeSheets sheets;
+    ScopedEnv language{"LANGUAGE", "en"};
+    ScopedEnv locale{"LC_ALL", "en_US.UTF-8"};
+    InPlace<StoreLookup, FakeStoreLookup> store;
+    InPlace<ExtensionRegistry, FakeExtensionRegistry> extensions;
+    InPlace<PublishingSupport, FakePublishingSupport> publishing;
+    FakeSheets sheets;
     std::unique_ptr<Window> window;
 };
 
 } // namespace
 
-TEST_F(EditorShareTest, SharesTheStoreTextTheLinkAndTheRecording) {
-    show();
-    testing_support::LogCapture log;
-    const auto sheet = share();
-    ASSERT_TRUE(sheet);
-    EXPECT_EQ(
-        sheet->activityItems(),
-        (QVariantList{QStringLiteral("Check out my recording of Racer by Example Games!"),
-                      QStringLiteral("https://store.example/apps/org.example.Racer"), recording}));
-    EXPECT_EQ(log.count("displayShareSheetWithVideoURL"), 1);
-    EXPECT_EQ(store->requests().size(), 1);
-    EXPECT_EQ(sheet->excludedActivityTypes(), QStringList{CopyToPasteboardActivityType});
-    EXPECT_TRUE(sheet->applicationActivities().isEmpty()) << "no publishing support here";
-    EXPECT_TRUE(sheet->preferredActivityOrder().isEmpty());
-    EXPECT_TRUE(sheet->hasCompletionWithItemsHandler());
-    // The wide layout: a popover at the share item.
-    EXPECT_EQ(sheet->modalPresentationStyle(), ViewController::ModalPresentationStyle::Popover);
-    EXPECT_EQ(sheet->popoverItem(), editor->shareButton);
-}
-
-TEST_F(EditorShareTest, AnOverrideMessageIsTheOnlyTextAndTheAttachmentComesLast) {
+TEST_F(EditorShareTest, TheTextIsTheOverrideMessageOrTheNameAloneWithoutAnAuthor) {
     show();
     editor->overrideShareMessage = "Look at this";
     editor->fileAttachmentURL = QUrl::fromLocalFile(QStringLiteral("/recordings/notes.txt"));
-    const auto sheet = share();
-    ASSERT_TRUE(sheet);
-    EXPECT_EQ(sheet->activityItems(),
+    EXPECT_EQ(share()->activityItems(),
               (QVariantList{QStringLiteral("Look at this"), recording,
                             QUrl::fromLocalFile(QStringLiteral("/recordings/notes.txt"))}));
-    EXPECT_EQ(store->requests().size(), 1) << "the details are fetched all the same";
-
-    sheet->finish(QString(), false);
+    EXPECT_EQ(store->requests.size(), 1) << "the details are fetched all the same";
     editor->overrideShareMessage = "";
-    const auto again = share();
-    ASSERT_TRUE(again);
-    EXPECT_EQ(again->activityItems().first(), QStringLiteral(""))
+    EXPECT_EQ(share()->activityItems().value(0), QStringLiteral(""))
         << "an empty message is a message";
-    EXPECT_EQ(again->activityItems().size(), 3);
-}
+    EXPECT_EQ(sheets.made.last()->activityItems().size(), 3);
 
-TEST_F(EditorShareTest, WithoutAnAuthorTheTextIsTheNameAloneAndWithoutALinkNoLink) {
-    store->response.results = {testing_support::storeItem("Notes", "", QString())};
-    show();
-    auto sheet = share();
-    ASSERT_TRUE(sheet);
-    EXPECT_EQ(sheet->activityItems(), (QVariantList{QStringLiteral("Notes"), recording}));
-
-    sheet->finish(QString(), false);
+    editor->overrideShareMessage = QString();
+    editor->fileAttachmentURL = QUrl();
+    store->response.results = {storeItem("Notes", "", QString())};
+    EXPECT_EQ(share()->activityItems(), (QVariantList{QStringLiteral("Notes"), recording}))
+        << "no author: the name alone; no link: no link item";
     store->response.results = {};
-    sheet = share();
-    ASSERT_TRUE(sheet);
-    EXPECT_EQ(sheet->activityItems().first(), QStringLiteral(""))
+    EXPECT_EQ(share()->activityItems(), (QVariantList{QStringLiteral(""), recording}))
         << "no details and no installed application: an empty text";
 }
 
@@ -133,14 +95,12 @@ TEST_F(EditorShareTest, YouTubeIsOfferedOnlyWithoutItsOwnExtensionAndWithSupport
     publishing->present = true;
     extensions->installed.insert(ExtensionRegistry::youTubeShareExtensionIdentifier, true);
     auto sheet = share();
-    ASSERT_TRUE(sheet);
     EXPECT_TRUE(sheet->applicationActivities().isEmpty()) << "the YouTube application shares";
     EXPECT_TRUE(sheet->preferredActivityOrder().isEmpty());
-    sheet->finish(QString(), false);
+    EXPECT_EQ(sheet->excludedActivityTypes(), QStringList{CopyToPasteboardActivityType});
 
     extensions->installed.insert(ExtensionRegistry::youTubeShareExtensionIdentifier, false);
     sheet = share();
-    ASSERT_TRUE(sheet);
     ASSERT_EQ(sheet->applicationActivities().size(), 1) << "a disabled extension does not count";
     EXPECT_TRUE(dynamic_cast<TXYouTubeActivity*>(sheet->applicationActivities().first().get()));
     EXPECT_EQ(sheet->preferredActivityOrder(),
@@ -148,16 +108,15 @@ TEST_F(EditorShareTest, YouTubeIsOfferedOnlyWithoutItsOwnExtensionAndWithSupport
                            CopyToPasteboardActivityType, PostToFacebookActivityType}));
     EXPECT_EQ(sheet->excludedActivityTypes(), QStringList{CopyToPasteboardActivityType})
         << "copy stays excluded although it is preferred";
-    sheet->finish(QString(), false);
 
     publishing->present = false;
     extensions->installed.clear();
-    sheet = share();
-    ASSERT_TRUE(sheet);
-    EXPECT_TRUE(sheet->applicationActivities().isEmpty()) << "no plug-in, no YouTube";
+    EXPECT_TRUE(share()->applicationActivities().isEmpty()) << "no plug-in, no YouTube";
 }
 
-TEST_F(EditorShareTest, AfterATrimmedSaveTheRecordingAsReceivedIsShared) {
+// The store's text and link, and the recording as received even after a
+// trimmed save, in a popover at the share item of the wide layout.
+TEST_F(EditorShareTest, SharesTheStoreTextTheLinkAndTheRecordingAsReceived) {
     show();
     // What the trimmed save's completion does: the player moves to the clip.
     const QUrl clip = QUrl::fromLocalFile(QStringLiteral("/clips/Racer_T.mp4"));
@@ -166,29 +125,29 @@ TEST_F(EditorShareTest, AfterATrimmedSaveTheRecordingAsReceivedIsShared) {
     ASSERT_EQ(editor->videoURL, clip);
     const auto sheet = share();
     ASSERT_TRUE(sheet);
-    EXPECT_EQ(sheet->activityItems().last(), recording);
+    EXPECT_EQ(
+        sheet->activityItems(),
+        (QVariantList{QStringLiteral("Check out my recording of Racer by Example Games!"),
+                      QStringLiteral("https://store.example/apps/org.example.Racer"), recording}));
+    EXPECT_EQ(log.count("displayShareSheetWithVideoURL"), 1);
+    EXPECT_EQ(store->requests.size(), 1);
+    EXPECT_TRUE(sheet->hasCompletionWithItemsHandler());
+    EXPECT_EQ(sheet->modalPresentationStyle(), ViewController::ModalPresentationStyle::Popover);
+    EXPECT_EQ(sheet->popoverItem(), editor->shareButton);
 }
 
 TEST_F(EditorShareTest, CompletedActivitiesAreRecordedEachTimeAndOthersNot) {
     show();
-    auto sheet = share();
-    ASSERT_TRUE(sheet);
-    sheet->finish(MailActivityType, true);
-    sheet = share();
-    ASSERT_TRUE(sheet);
-    sheet->finish(MailActivityType, true);
-    sheet = share();
-    ASSERT_TRUE(sheet);
-    sheet->finish(MessageActivityType, false);
-    sheet = share();
-    ASSERT_TRUE(sheet);
-    sheet->cancel();
+    share();
+    share(MailActivityType, true);
+    share(MailActivityType, true);
+    share(MessageActivityType, false);
+    sheets.made.last()->cancel();
     EXPECT_EQ(editor->activityTypes, (QStringList{MailActivityType, MailActivityType}));
     EXPECT_EQ(editor->presentedViewController(), nullptr) << "the editing goes on";
 
     editor->doneAction();
-    ASSERT_EQ(delegate->reports.size(), 1);
-    EXPECT_EQ(delegate->reports.first(), (QStringList{MailActivityType, MailActivityType}));
+    EXPECT_EQ(delegate->reports, (QList<QStringList>{{MailActivityType, MailActivityType}}));
 }
 
 TEST_F(EditorShareTest, OnATabletInIntroModeTheToolbarHasNoPlayButtonAndDoneLeads) {
@@ -196,30 +155,24 @@ TEST_F(EditorShareTest, OnATabletInIntroModeTheToolbarHasNoPlayButtonAndDoneLead
     ASSERT_TRUE(editor->isPadMode());
     ASSERT_TRUE(editor->isIntroMode());
     ASSERT_TRUE(share());
-    EXPECT_EQ(editor->topToolBar->items(),
-              (Toolbar::ItemList{editor->doneButton, editor->flexSpace, editor->titleButton,
-                                 editor->flexSpace, editor->fixSpace, editor->shareButton,
-                                 editor->fixSpace, editor->saveButton}));
-    sheets.last()->cancel();
-
+    EXPECT_EQ(topItems(), (QStringList{"doneButton", "flexSpace", "titleButton", "flexSpace",
+                                       "fixSpace", "shareButton", "fixSpace", "saveButton"}));
     editor->setIntroMode(false);
     ASSERT_TRUE(share());
-    EXPECT_EQ(editor->topToolBar->items(),
-              (Toolbar::ItemList{editor->doneButton, editor->flexSpace, editor->titleButton,
-                                 editor->flexSpace, editor->playButton, editor->fixSpace,
-                                 editor->shareButton, editor->fixSpace, editor->saveButton}));
+    EXPECT_EQ(topItems(),
+              (QStringList{"doneButton", "flexSpace", "titleButton", "flexSpace", "playButton",
+                           "fixSpace", "shareButton", "fixSpace", "saveButton"}));
 }
 
 TEST_F(EditorShareTest, OnAPhoneTheSheetFillsTheWindow) {
     Device::setInterfaceIdiomOverride(Device::InterfaceIdiom::Phone);
     show(QSize(390, 700));
     ASSERT_FALSE(editor->isPadMode());
-    const auto bottom = editor->bottomToolBar->items();
+    const QStringList bottom = bottomItems();
     const auto sheet = share();
     ASSERT_TRUE(sheet);
     EXPECT_EQ(sheet->modalPresentationStyle(), ViewController::ModalPresentationStyle::FullScreen);
-    EXPECT_EQ(editor->topToolBar->items(),
-              (Toolbar::ItemList{editor->doneButton, editor->flexSpace, editor->titleButton,
-                                 editor->flexSpace, editor->saveButton}));
-    EXPECT_EQ(editor->bottomToolBar->items(), bottom);
+    EXPECT_EQ(topItems(),
+              (QStringList{"doneButton", "flexSpace", "titleButton", "flexSpace", "saveButton"}));
+    EXPECT_EQ(bottomItems(), bottom);
 }

@@ -1,6 +1,10 @@
 #include "ShareFakes.h"
 
-#include "platform/runtime/MainQueue.h"
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
+#include <QNetworkAccessManager>
+#include <QNetworkReply>
 
 #include <thread>
 
@@ -8,26 +12,26 @@ using namespace platform;
 
 namespace testing_support {
 
+void writeText(const QString& path, const QByteArray& text, bool executable) {
+    QDir().mkpath(QFileInfo(path).path());
+    QFile file(path);
+    if (!file.open(QIODevice::WriteOnly))
+        qFatal("cannot write %s", qPrintable(path));
+    file.write(text);
+    if (executable)
+        file.setPermissions(file.permissions() | QFile::ExeOwner);
+}
+
 void FakeStoreLookup::startRequest(const StoreLookupRequest& request, Callback callback) {
-    {
-        std::lock_guard lock(mutex_);
-        requests_.append(request);
-    }
-    std::thread([this, callback = std::move(callback), response = response, error = error] {
-        calledOnMainThread = MainQueue::isCurrent();
+    requests.append(request);
+    std::thread([callback, response = response, error = error] {
         callback(response, error);
     }).detach();
 }
 
-QList<StoreLookupRequest> FakeStoreLookup::requests() const {
-    std::lock_guard lock(mutex_);
-    return requests_;
-}
-
 QVariantMap storeItem(const QString& name, const QString& artist, const QString& link,
                       const QStringList& genres) {
-    QVariantMap item;
-    item.insert(StoreItemKey::displayName, name);
+    QVariantMap item{{StoreItemKey::displayName, name}};
     if (!artist.isNull())
         item.insert(StoreItemKey::artistName, artist);
     if (!link.isNull())
@@ -39,18 +43,31 @@ QVariantMap storeItem(const QString& name, const QString& artist, const QString&
 
 std::optional<ExtensionManifest>
 FakeExtensionRegistry::extensionWithIdentifier(const QString& identifier, bool excludingDisabled) {
-    if (!installed.contains(identifier))
+    if (!installed.contains(identifier) || (excludingDisabled && !installed.value(identifier)))
         return std::nullopt;
     ExtensionManifest manifest;
     manifest.identifier = identifier;
     manifest.enabled = installed.value(identifier);
-    if (excludingDisabled && !manifest.enabled)
-        return std::nullopt;
     return manifest;
 }
 
+bool FakeActivity::canPerformWithActivityItems(const QVariantList& items) {
+    askedItems = items;
+    return canPerform;
+}
+
+void FakeActivity::prepareWithActivityItems(const QVariantList& items) {
+    calls << QStringLiteral("prepare");
+    askedItems = items;
+}
+
+std::shared_ptr<ViewController> FakeActivity::activityViewController() {
+    calls << QStringLiteral("activityViewController");
+    return controller;
+}
+
 void FakeActivity::performActivity() {
-    calls.append(QStringLiteral("perform"));
+    calls << QStringLiteral("perform");
     if (completesWith)
         activityDidFinish(*completesWith);
 }
@@ -60,40 +77,58 @@ bool FakeActivitySheet::performActivityNamed(const QString& type) {
     return true;
 }
 
-void FakeActivitySheet::cancel() {
-    if (presentingViewController())
-        dismissViewControllerAnimated_completion(false);
-    reportCompletion(QString(), false);
-}
-
 void FakeActivitySheet::finish(const QString& type, bool completed) {
     if (presentingViewController())
         dismissViewControllerAnimated_completion(false);
     reportCompletion(type, completed);
 }
 
-QList<std::shared_ptr<FakeActivitySheet>>& FakeActivitySheet::made() {
-    static QList<std::shared_ptr<FakeActivitySheet>> sheets;
-    return sheets;
-}
-
 FakeSheets::FakeSheets()
-    : replacement_(ActivityViewController::implementation().replace(
-          [](const QVariantList& items, const ActivityViewController::ActivityList& activities)
+    : replacement(ActivityViewController::implementation().replace(
+          [this](const QVariantList& items, const ActivityViewController::ActivityList& activities)
               -> std::shared_ptr<ActivityViewController> {
-              auto sheet = std::make_shared<FakeActivitySheet>(items, activities);
-              FakeActivitySheet::made().append(sheet);
-              return sheet;
-          })) {
-    FakeActivitySheet::made().clear();
+              made.append(std::make_shared<FakeActivitySheet>(items, activities));
+              return made.last();
+          })) {}
+
+class FakeBrowser::Opener final : public UrlOpener {
+  public:
+    bool openURL(const QUrl& url) override {
+        opened.append(url);
+        if (behaviour != Behaviour::Follow)
+            return behaviour == Behaviour::Record;
+        QNetworkRequest request(url);
+        request.setAttribute(QNetworkRequest::RedirectPolicyAttribute,
+                             QNetworkRequest::NoLessSafeRedirectPolicy);
+        QNetworkReply* reply = network.get(request);
+        QObject::connect(reply, &QNetworkReply::finished, reply, [this, reply] {
+            lastPage = reply->readAll();
+            reply->deleteLater();
+        });
+        return true;
+    }
+    Behaviour behaviour = Behaviour::Record;
+    QNetworkAccessManager network;
+    QList<QUrl> opened;
+    QByteArray lastPage;
+};
+
+FakeBrowser::FakeBrowser(Behaviour behaviour)
+    : opener_(std::make_shared<Opener>()),
+      replacement_(UrlOpener::implementation().replace([opener = opener_] { return opener; })) {
+    opener_->behaviour = behaviour;
 }
 
-FakeSheets::~FakeSheets() {
-    FakeActivitySheet::made().clear();
+void FakeBrowser::setBehaviour(Behaviour behaviour) {
+    opener_->behaviour = behaviour;
 }
 
-std::shared_ptr<FakeActivitySheet> FakeSheets::last() const {
-    return FakeActivitySheet::made().isEmpty() ? nullptr : FakeActivitySheet::made().last();
+QList<QUrl> FakeBrowser::opened() const {
+    return opener_->opened;
+}
+
+QByteArray FakeBrowser::lastPage() const {
+    return opener_->lastPage;
 }
 
 } // namespace testing_support

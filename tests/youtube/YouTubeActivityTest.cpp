@@ -1,37 +1,95 @@
-// The activity from the sheet's side: identity, preparing the upload file and
-// the form it hands back, pre-filled and with its category preselected.
+// The YouTube activity against fakes of the export session, the plug-in
+// loader, the agent and the browser: its identity, the upload file and the
+// form it hands the sheet, and the alert whose buttons finish it.
 
-#include "ActivityFixture.h"
+#include "ShareFakes.h"
+#include "YouTubeFakes.h"
 #include "media/MediaFixtures.h"
 #include "platform/media/Asset.h"
 #include "platform/runtime/DevicePaths.h"
+#include "platform/runtime/Error.h"
+#include "platform/runtime/MethodTable.h"
 #include "platform/services/PublishingPlugin.h"
+#include "platform/ui/Alert.h"
 #include "platform/ui/NavigationController.h"
+#include "platform/ui/Window.h"
+#include "support/LogCapture.h"
+#include "support/TempDir.h"
+#include "support/Wait.h"
+#include "youtube/TXYouTubeActivity.h"
 
 #include <QDateTime>
+#include <QFile>
+#include <QLineEdit>
 #include <QProcess>
+#include <QPushButton>
 #include <QRegularExpression>
 #include <QStandardPaths>
+#include <QTest>
+#include <gtest/gtest.h>
 
 using namespace platform;
-using testing_support::ScopedEnv;
+using namespace testing_support;
 
 namespace {
 
-// The test movie with its audio track twice, as a recorder writes a desktop
-// and a microphone track; empty when ffmpeg is not there to make it.
-QString movieWithTwoAudioTracks(const QString& source) {
-    const QString ffmpeg = QStandardPaths::findExecutable(QStringLiteral("ffmpeg"));
-    if (ffmpeg.isEmpty())
-        return {};
-    const QString output = mediatest::scratchPath(QStringLiteral("two-audio-tracks.mp4"));
-    QProcess process;
-    process.start(ffmpeg, {"-y", "-v", "error", "-i", source, "-i", source, "-map", "0:v", "-map",
-                           "0:a", "-map", "1:a", "-c", "copy", output});
-    if (!process.waitForFinished(60000) || process.exitCode() != 0)
-        return {};
-    return output;
-}
+const QString kWatchURL = QStringLiteral("https://www.youtube.com/watch?v=dQw4w9WgXcQ");
+
+// A YouTube activity as the sheet holds it, in a temporary device, over a
+// real movie made for the test run.
+class ActivityFixture : public ::testing::Test {
+  protected:
+    ActivityFixture() {
+        for (const char* name : {"LC_ALL", "LC_MESSAGES", "LANGUAGE"})
+            language.unset(name);
+        language.set("LANG", "en_US.UTF-8");
+        device.makeLibrary();
+        loader->agentClass = &FakePublishingAgent::staticMetaObject;
+        FakePublishingAgent::nextFormHasMembers = true;
+        activity->setFinishHandler([this](bool completed) {
+            finished = completed;
+            ++finishes;
+        });
+    }
+    ~ActivityFixture() override {
+        // Each controller request exchanges the form's preselection code with
+        // the activity's; the next test starts from the form's own.
+        FakeUploadForm probe;
+        probe.categoriesDidArrive({});
+        if (probe.ownSelections == 0)
+            MethodTable::exchangeImplementations(&FakeUploadForm::staticMetaObject,
+                                                 &TXYouTubeActivity::staticMetaObject,
+                                                 "_selectComedyPickerRow");
+    }
+
+    QVariantList items() const {
+        return {QStringLiteral("Check out my recording of Racer by Example Games!"),
+                QUrl(QStringLiteral("https://flathub.org/apps/org.example.Racer")),
+                QUrl::fromLocalFile(moviePath)};
+    }
+    // Prepares the activity and asks for its controller, as the sheet does
+    // once the user picked it.
+    std::shared_ptr<ViewController> pick() {
+        activity->prepareWithActivityItems(items());
+        return activity->activityViewController();
+    }
+    FakeUploadForm* form() const { return FakePublishingAgent::last()->form(); }
+
+    MobileRoot device;
+    ScopedEnv language;
+    ControlledExportSessions exports;
+    InPlace<PublishingPluginLoader, FakePluginLoader> loader;
+    FakeBrowser browser;
+    LogCapture log;
+    QString moviePath = mediatest::movieFor([] {
+        testmedia::MovieSpec shape;
+        shape.seconds = 1;
+        return shape;
+    }());
+    std::shared_ptr<TXYouTubeActivity> activity = TXYouTubeActivity::init();
+    std::optional<bool> finished; // the completed flag the activity finished with
+    int finishes = 0;
+};
 
 } // namespace
 
@@ -44,45 +102,34 @@ TEST_F(ActivityFixture, IdentityIsFixedAndTheDeviceDecidesWhetherItCanPerform) {
         ScopedEnv off("TAMSEL_DISABLED_CAPABILITIES", "video-publishing");
         EXPECT_FALSE(activity->canPerformWithActivityItems(items()));
     }
-
-    const QImage icon = activity->activityImage();
-    ASSERT_FALSE(icon.isNull());
-    EXPECT_EQ(icon.deviceIndependentSize(), QSizeF(48, 48));
-    EXPECT_EQ(TXYouTubeActivity::photoUIBundle(), TXYouTubeActivity::photoUIBundle());
-
-    // On a tile with rounded corners: the corner is clear, the middle drawn.
-    const QImage settings = activity->_activitySettingsImage();
-    EXPECT_EQ(settings.deviceIndependentSize(), QSizeF(29, 29));
-    EXPECT_EQ(qAlpha(settings.pixel(0, 0)), 0);
-    EXPECT_EQ(qAlpha(settings.pixel(settings.width() / 2, settings.height() / 2)), 255);
+    EXPECT_EQ(activity->activityImage().deviceIndependentSize(), QSizeF(48, 48));
+    EXPECT_EQ(activity->_activitySettingsImage().deviceIndependentSize(), QSizeF(29, 29));
 }
 
 TEST_F(ActivityFixture, TheUploadFileIsNamedByTheSecondInTheTemporaryDirectory) {
     const qint64 before = QDateTime::currentSecsSinceEpoch();
     const QUrl url = activity->tempFileURL();
-    const qint64 after = QDateTime::currentSecsSinceEpoch();
-
-    ASSERT_TRUE(url.isLocalFile());
     const auto match =
         QRegularExpression(R"(^/private/var/mobile/Library/Tamsel//TXCapture_YouTube(\d+)\.mp4$)")
             .match(url.path());
-    ASSERT_TRUE(match.hasMatch()) << url.path().toStdString();
-    const qint64 seconds = match.captured(1).toLongLong();
-    EXPECT_GE(seconds, before);
-    EXPECT_LE(seconds, after);
-    // The device path lands in the device's temporary directory here.
+    ASSERT_TRUE(url.isLocalFile() && match.hasMatch()) << url.toString().toStdString();
+    EXPECT_GE(match.captured(1).toLongLong(), before);
+    EXPECT_LE(match.captured(1).toLongLong(), QDateTime::currentSecsSinceEpoch());
     EXPECT_EQ(QFileInfo(DevicePaths::hostPathOfUrl(url)).absolutePath(),
               device.hostPath("Library/Tamsel"));
 }
 
 TEST_F(ActivityFixture, PreparingExportsAtHighestQualityWithEveryAudioTrackAndComposesTheText) {
-    const QString movie = movieWithTwoAudioTracks(moviePath);
-    if (movie.isEmpty())
+    // The movie with its audio track twice, as a recorder writes a desktop
+    // and a microphone track.
+    const QString movie = mediatest::scratchPath(QStringLiteral("two-audio-tracks.mp4"));
+    if (QStandardPaths::findExecutable("ffmpeg").isEmpty() ||
+        QProcess::execute("ffmpeg", {"-y", "-v", "error", "-i", moviePath, "-i", moviePath, "-map",
+                                     "0:v", "-map", "0:a", "-map", "1:a", "-c", "copy", movie}))
         GTEST_SKIP() << "ffmpeg is needed to make a movie with two audio tracks";
     activity->prepareWithActivityItems({QStringLiteral("T"),
                                         QUrl(QStringLiteral("https://example.org/L?a=1")),
                                         QUrl::fromLocalFile(movie)});
-
     EXPECT_EQ(activity->descriptionText, "T https://example.org/L?a=1");
     ASSERT_EQ(exports.made.size(), 1);
     const auto& session = *exports.made[0];
@@ -92,32 +139,29 @@ TEST_F(ActivityFixture, PreparingExportsAtHighestQualityWithEveryAudioTrackAndCo
     EXPECT_TRUE(activity->movieURL.path().contains("/Tamsel//TXCapture_YouTube"));
     EXPECT_EQ(session.outputFileType(), FileTypeMPEG4);
     EXPECT_EQ(session.starts, 1);
-
     // One record per audio track, in the asset's order, levels untouched.
     const std::optional<AudioMix> mix = session.audioMix();
     ASSERT_TRUE(mix);
-    QList<int> mixed;
+    QList<int> mixed, audioTracks;
     for (const AudioMixInputParameters& input : mix->inputParameters) {
         mixed.append(input.trackID);
         EXPECT_EQ(input.volume, 1.0f);
     }
-    QList<int> audioTracks;
-    const auto asset = session.asset();
-    for (const AssetTrack& track : asset->tracksWithMediaType(MediaType::Audio))
+    for (const AssetTrack& track : session.asset()->tracksWithMediaType(MediaType::Audio))
         audioTracks.append(track.trackID);
     EXPECT_EQ(audioTracks.size(), 2);
     EXPECT_EQ(mixed, audioTracks);
 }
 
 TEST_F(ActivityFixture, OnlyAnExportThatNeitherFailedNorWasCancelledIsLogged) {
-    const QString line = QStringLiteral("TXYouTubeActivity: Export Mixed YouTube Video Complete.");
     for (const auto status : {ExportSessionStatus::Failed, ExportSessionStatus::Cancelled,
                               ExportSessionStatus::Completed}) {
         activity->prepareWithActivityItems(items());
         exports.made.last()->finish(status);
     }
-    EXPECT_EQ(log.count(LogLevel::Default, line), 1);
-    EXPECT_EQ(log.count(line), 1);
+    EXPECT_EQ(log.count(LogLevel::Default,
+                        QStringLiteral("TXYouTubeActivity: Export Mixed YouTube Video Complete.")),
+              1);
 }
 
 TEST_F(ActivityFixture, ItemsWithoutAMovieGiveAnExportThatCannotSucceedNotACrash) {
@@ -129,7 +173,6 @@ TEST_F(ActivityFixture, ItemsWithoutAMovieGiveAnExportThatCannotSucceedNotACrash
               "Look at this " + QUrl::fromLocalFile(moviePath).toString(QUrl::FullyEncoded));
     ASSERT_EQ(exports.made.size(), 1);
     EXPECT_TRUE(exports.made[0]->asset()->tracks().isEmpty());
-    EXPECT_EQ(exports.made[0]->outputURL(), activity->movieURL);
 }
 
 TEST_F(ActivityFixture, TheControllerIsTheAgentsStackWithTheDescriptionFilledIn) {
@@ -138,17 +181,14 @@ TEST_F(ActivityFixture, TheControllerIsTheAgentsStackWithTheDescriptionFilledIn)
     ASSERT_TRUE(agent);
     EXPECT_EQ(activity->publishingAgent.get(), agent);
     EXPECT_EQ(controller, agent->navigationController());
-    EXPECT_EQ(agent->delegateSets, 1);
     EXPECT_EQ(agent->delegate().get(), static_cast<TXPublishingAgentDelegate*>(activity.get()));
     EXPECT_EQ(agent->mediaPath, activity->movieURL.path());
-
-    FakeUploadForm* form = agent->form();
-    EXPECT_EQ(form->table_.descriptionCell.value,
-              "Check out my recording of Racer by Example Games! "
-              "https://flathub.org/apps/org.example.Racer");
-    EXPECT_EQ(form->table_.descriptionCell.placeholder, "");
-    EXPECT_EQ(form->table_.titleCell.value, "");
-    EXPECT_EQ(form->table_.titleCell.placeholder, "Title");
+    const FakeFormMembers& table = form()->members_;
+    EXPECT_EQ(table.description.value, "Check out my recording of Racer by Example Games! "
+                                       "https://flathub.org/apps/org.example.Racer");
+    EXPECT_EQ(table.description.placeholder, "");
+    EXPECT_EQ(table.title.value, "");
+    EXPECT_EQ(table.title.placeholder, "Title");
 
     // The plug-in is loaded once for the life of the process, from its path,
     // and its agent class found by name.
@@ -156,58 +196,166 @@ TEST_F(ActivityFixture, TheControllerIsTheAgentsStackWithTheDescriptionFilledIn)
     second->prepareWithActivityItems(items());
     EXPECT_TRUE(second->activityViewController());
     EXPECT_NE(second->publishingAgent, activity->publishingAgent);
-    EXPECT_EQ(FakePluginLoader::loads.load(), 1);
-    EXPECT_EQ(FakePluginLoader::loadedPaths, QStringList{PublishingPlugin::youTubePluginPath});
-    EXPECT_EQ(FakePluginLoader::lookedUp, QStringList{PublishingPlugin::youTubeAgentClassName});
+    EXPECT_EQ(FakePluginLoader::asked,
+              (QStringList{"load " + PublishingPlugin::youTubePluginPath,
+                           "class " + PublishingPlugin::youTubeAgentClassName}));
 }
 
-TEST_F(ActivityFixture, TheCategoryWithIdentifierTwentyIsPreselected) {
+// Each request for the controller exchanges the preselection code between
+// the form's class and the activity: the odd ones put the activity's in place.
+TEST_F(ActivityFixture, TheCategoryWithIdentifierTwentyIsPreselectedUntilTheNextRequest) {
     pick();
-    FakeUploadForm* form = FakePublishingAgent::last()->form();
-
-    form->categoriesDidArrive(
-        {category("10", "Music"), category("20", "Gaming"), category("22", "People & Blogs")});
-    EXPECT_EQ(form->ownSelections, 0);
-    EXPECT_EQ(form->picker_.selections, (QList<std::tuple<int, int, bool>>{{1, 0, false}}));
-    EXPECT_EQ(form->categoryCell_.categoryStrings, QStringList{"Gaming"});
-    EXPECT_EQ(form->defaultCategory, "20");
-
+    FakeUploadForm* first = form();
+    first->categoriesDidArrive({"10:Music", "20:Gaming", "22:People & Blogs"});
+    EXPECT_EQ(first->members_.calls, (QStringList{"category Gaming", "select 1 0 0"}));
+    EXPECT_EQ(first->defaultCategory, "20");
     // Without the category, or without any, the form is left as it was.
-    form->categoriesDidArrive({category("1", "Film"), category("2", "Autos")});
-    form->categoriesDidArrive({});
-    EXPECT_EQ(form->picker_.selections.size(), 1);
-    EXPECT_EQ(form->categoryCell_.categoryStrings.size(), 1);
-    EXPECT_EQ(form->defaultCategory, "20");
-    EXPECT_EQ(form->ownSelections, 0);
-}
+    first->categoriesDidArrive({"1:Film", "2:Autos"});
+    first->categoriesDidArrive({});
+    EXPECT_EQ(first->members_.calls.size(), 2);
+    EXPECT_EQ(first->defaultCategory, "20");
+    EXPECT_EQ(first->ownSelections, 0);
 
-TEST_F(ActivityFixture, ASecondControllerRequestSwapsThePreselectionBackToTheFormsOwn) {
-    pick();
-    FakeUploadForm* first = FakePublishingAgent::last()->form();
-    activity->activityViewController();
-    FakeUploadForm* second = FakePublishingAgent::last()->form();
-    ASSERT_NE(first, second);
-
-    const QVariantList categories{category("10", "Music"), category("20", "Gaming")};
-    first->categoriesDidArrive(categories);
-    second->categoriesDidArrive(categories);
-    EXPECT_EQ(first->ownSelections, 1);
-    EXPECT_EQ(second->ownSelections, 1);
-    EXPECT_TRUE(first->picker_.selections.isEmpty());
-    EXPECT_TRUE(second->picker_.selections.isEmpty());
-    EXPECT_EQ(second->defaultCategory, "22");
-}
-
-TEST_F(ActivityFixture, AFormWithoutItsMembersIsNeitherFilledNorPreselectedButStillShown) {
     FakePublishingAgent::nextFormHasMembers = false;
-    const auto controller = pick();
-    ASSERT_TRUE(controller);
-    FakeUploadForm* form = FakePublishingAgent::last()->form();
-    EXPECT_EQ(form->table_.descriptionCell.value, "");
-    EXPECT_EQ(form->table_.descriptionCell.placeholder, "Description");
+    activity->activityViewController();
+    first->categoriesDidArrive({"10:Music", "20:Gaming"});
+    EXPECT_EQ(first->ownSelections, 1) << "the second request swapped the form's own back";
+    EXPECT_EQ(first->members_.calls.size(), 2);
 
-    form->categoriesDidArrive({category("20", "Gaming")});
-    EXPECT_TRUE(form->picker_.selections.isEmpty());
-    EXPECT_TRUE(form->categoryCell_.categoryStrings.isEmpty());
-    EXPECT_EQ(form->ownSelections, 0);
+    // A form without its members is neither filled nor preselected, but shown.
+    EXPECT_TRUE(activity->activityViewController());
+    form()->categoriesDidArrive({"20:Gaming"});
+    EXPECT_EQ(form()->ownSelections, 0);
+    EXPECT_EQ(form()->members_.description.value, "");
+    EXPECT_EQ(form()->members_.description.placeholder, "Description");
+    EXPECT_TRUE(form()->members_.calls.isEmpty());
+}
+
+// A device without the plug-in, or with one that lacks the agent class,
+// stops the process when the activity first needs the agent.
+TEST_F(ActivityFixture, AMissingPluginOrAgentClassStopsTheProcess) {
+    GTEST_FLAG_SET(death_test_style, "threadsafe");
+    loader->agentClass = nullptr;
+    EXPECT_DEATH(pick(), "Unable to find class YouTubePublishingAgent");
+    loader->loadError = QStringLiteral("libtamsel-youtube-publishing.so: cannot open shared "
+                                       "object file: No such file or directory");
+    EXPECT_DEATH(pick(), "libtamsel-youtube-publishing.so: cannot open shared object file: No "
+                         "such file or directory");
+}
+
+namespace {
+
+// The sheet presents the agent's stack in the window; the upload file exists.
+class PublishingFixture : public ActivityFixture {
+  protected:
+    void SetUp() override {
+        window.setRootViewController(pick());
+        window.resize(480, 640);
+        window.show();
+        window.activateWindow();
+        ASSERT_TRUE(QTest::qWaitForWindowActive(&window));
+        agent = FakePublishingAgent::last();
+        writeFile(DevicePaths::hostPathOfUrl(activity->movieURL), 4096);
+    }
+
+    Alert* alert() const {
+        return qobject_cast<Alert*>(agent->navigationController()->presentedViewController());
+    }
+    QStringList actionTitles() const {
+        QStringList titles;
+        for (const auto& action : alert()->actions())
+            titles.append(action->title());
+        return titles;
+    }
+    // Publishing ends as `error` says: the alert comes, and the upload file
+    // goes while it is still up.
+    void endWith(ErrorPtr error) {
+        agent->pressPublish();
+        ASSERT_TRUE(waitUntil([&] { return activity->progressOverlay->activityIndicator(); }));
+        agent->endPublishing(error, kWatchURL);
+        ASSERT_TRUE(alert());
+        EXPECT_TRUE(uploadFileRemoved());
+        EXPECT_FALSE(finished);
+    }
+    // A press on the alert's button with that title, as the user makes it;
+    // what the activity finished with.
+    std::optional<bool> press(const QString& title) {
+        for (const auto& action : alert()->actions())
+            if (action->title() == title)
+                QTest::mouseClick(alert()->buttonForAction(action.get()), Qt::LeftButton);
+        waitUntil([&] { return finished.has_value(); });
+        EXPECT_EQ(finishes, 1);
+        return finished;
+    }
+    bool uploadFileRemoved() const {
+        return waitUntil(
+            [&] { return !QFile::exists(DevicePaths::hostPathOfUrl(activity->movieURL)); });
+    }
+
+    Window window;
+    FakePublishingAgent* agent = nullptr;
+};
+
+} // namespace
+
+TEST_F(PublishingFixture, CancelFinishesAsNotCompletedAndRemovesTheUploadFile) {
+    agent->pressCancel();
+    EXPECT_EQ(finished, false);
+    EXPECT_TRUE(uploadFileRemoved());
+    EXPECT_EQ(exports.made.last()->cancels, 1) << "an export still writing the file stops";
+    EXPECT_FALSE(alert());
+}
+
+TEST_F(PublishingFixture, PublishEndsEditingAndCoversTheAgentsScreenWithTheOverlay) {
+    auto* field = new QLineEdit(form()->view());
+    field->show();
+    QString committed;
+    QObject::connect(field, &QLineEdit::editingFinished, [&] { committed = field->text(); });
+    field->setFocus();
+    QTest::keyClicks(field, "My run");
+    ASSERT_EQ(window.focusWidget(), field);
+    agent->pressPublish();
+    EXPECT_NE(window.focusWidget(), field);
+    EXPECT_EQ(committed, "My run");
+
+    View* screen = agent->navigationController()->view();
+    ASSERT_TRUE(activity->progressOverlay);
+    EXPECT_EQ(activity->progressOverlay->superview(), screen);
+    EXPECT_EQ(activity->progressOverlay->frame(), screen->bounds());
+    EXPECT_TRUE(activity->progressOverlay->isShowing());
+    EXPECT_FALSE(finished);
+}
+
+TEST_F(PublishingFixture, AfterSuccessViewFinishesAsCompletedAndOpensTheVideo) {
+    endWith(nullptr);
+    EXPECT_EQ(alert()->title(), "Your video has been published.");
+    EXPECT_EQ(alert()->message(), "");
+    EXPECT_EQ(alert()->preferredStyle(), Alert::Style::Alert);
+    EXPECT_EQ(actionTitles(), (QStringList{"View on YouTube", "Close"}));
+    EXPECT_EQ(alert()->actions()[0]->style(), AlertAction::Style::Default);
+    EXPECT_EQ(alert()->actions()[1]->style(), AlertAction::Style::Cancel);
+    // The spinner stops; the dimming stays under the alert.
+    EXPECT_NE(activity->progressOverlay->activityIndicator()->parentWidget(),
+              activity->progressOverlay.get());
+    EXPECT_TRUE(activity->progressOverlay->superview());
+    EXPECT_EQ(press("View on YouTube"), true);
+    EXPECT_EQ(browser.opened(), QList<QUrl>{QUrl(kWatchURL)});
+    EXPECT_TRUE(waitUntil([&] { return !alert(); }));
+}
+
+TEST_F(PublishingFixture, AfterSuccessCloseFinishesAsNotCompletedInTheUsersLanguage) {
+    ScopedEnv german("LANG", "de_DE.UTF-8");
+    endWith(nullptr);
+    EXPECT_EQ(alert()->title(), "Dein Video wurde veröffentlicht.");
+    EXPECT_EQ(actionTitles(), (QStringList{"Auf YouTube ansehen", "Schließen"}));
+    EXPECT_EQ(press("Schließen"), false);
+    EXPECT_TRUE(browser.opened().isEmpty());
+}
+
+TEST_F(PublishingFixture, AfterFailureOnlyCloseIsOfferedAndItFinishesAsCompleted) {
+    endWith(makeError(403, "YouTubeErrorDomain", "quotaExceeded"));
+    EXPECT_EQ(alert()->title(), "Your video could not be published.");
+    EXPECT_EQ(actionTitles(), QStringList{"Close"});
+    EXPECT_EQ(press("Close"), true);
+    EXPECT_TRUE(browser.opened().isEmpty());
 }

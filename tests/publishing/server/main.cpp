@@ -1,10 +1,11 @@
-// tamsel-fake-youtube: the local fake of the sign-in and upload API as a
-// process of its own, for the benchmark and for trying the editor by hand.
-// Prints the environment that points the plug-in at it, one NAME=VALUE a
-// line, then an empty line, and serves until its standard input closes.
+// tamsel-fake-youtube [--discard] [--access-token T] [--refresh-token T]: the
+// local fake of the sign-in and upload API as a process of its own, for the
+// benchmark and for trying the editor by hand. Prints the environment that
+// points the plug-in at it, one NAME=VALUE a line, then an empty line, and
+// serves until its standard input closes. --discard counts what arrives
+// instead of storing it.
 #include "FakeYouTubeServer.h"
 
-#include <QCommandLineParser>
 #include <QCoreApplication>
 #include <QSocketNotifier>
 #include <QTemporaryDir>
@@ -14,46 +15,23 @@
 
 int main(int argc, char** argv) {
     QCoreApplication app(argc, argv);
-    QCommandLineParser parser;
-    parser.setApplicationDescription(QStringLiteral("Local fake of the YouTube upload API"));
-    parser.addHelpOption();
-    const QCommandLineOption storage(
-        QStringLiteral("storage"), QStringLiteral("Directory for the uploads (default: temporary)"),
-        QStringLiteral("dir"));
-    const QCommandLineOption token(QStringLiteral("access-token"),
-                                   QStringLiteral("An access token to accept"),
-                                   QStringLiteral("token"));
-    const QCommandLineOption refresh(QStringLiteral("refresh-token"),
-                                     QStringLiteral("A refresh token to accept"),
-                                     QStringLiteral("token"));
-    const QCommandLineOption discard(QStringLiteral("discard"),
-                                     QStringLiteral("Count uploaded bytes without storing them"));
-    const QCommandLineOption delay(QStringLiteral("delay"),
-                                   QStringLiteral("Milliseconds every answer waits"),
-                                   QStringLiteral("ms"));
-    parser.addOptions({storage, token, refresh, discard, delay});
-    parser.process(app);
-
-    QTemporaryDir temporary;
-    const QString dir = parser.isSet(storage) ? parser.value(storage) : temporary.path();
-    testing_support::FakeYouTubeServer server(dir);
+    const QStringList args = app.arguments();
+    const auto option = [&](const char* name) {
+        const qsizetype at = args.indexOf(QLatin1String(name));
+        return at > 0 ? args.value(at + 1) : QString();
+    };
+    QTemporaryDir storage;
+    testing_support::FakeYouTubeServer server(
+        args.contains(QLatin1String("--discard")) ? QString() : storage.path());
     if (!server.start()) {
         std::fprintf(stderr, "tamsel-fake-youtube: cannot listen on 127.0.0.1\n");
         return 1;
     }
-    if (parser.isSet(token))
-        server.addAccessToken(parser.value(token), 24 * 3600);
-    if (parser.isSet(refresh))
-        server.addRefreshToken(parser.value(refresh));
-    server.setStoresUploads(!parser.isSet(discard));
-    if (parser.isSet(delay)) {
-        auto faults = server.faults();
-        faults.responseDelayMs = parser.value(delay).toInt();
-        server.setFaults(faults);
-    }
-    for (const QString& line : server.environment())
-        std::printf("%s\n", qPrintable(line));
-    std::printf("\n");
+    if (const QString token = option("--access-token"); !token.isEmpty())
+        server.addAccessToken(token);
+    if (const QString token = option("--refresh-token"); !token.isEmpty())
+        server.addRefreshToken(token);
+    std::printf("%s\n\n", qPrintable(server.environment().join(QLatin1Char('\n'))));
     std::fflush(stdout);
 
     QSocketNotifier input(STDIN_FILENO, QSocketNotifier::Read);
