@@ -6,6 +6,7 @@
 #include <QFrame>
 #include <QKeyEvent>
 #include <QLabel>
+#include <QPointer>
 #include <QPushButton>
 #include <QTimer>
 
@@ -135,8 +136,14 @@ void Alert::buildButtons() {
         buttons_.append(button);
     }
     // Focus on the default action once shown, so Return and Space pick it.
-    QTimer::singleShot(0, this, [this] {
-        for (QPushButton* button : std::as_const(buttons_)) {
+    // The buttons go with the alert's view, which may go before the alert
+    // does: the timer is tied to the view, not to the alert.
+    if (buttons_.isEmpty())
+        return;
+    QTimer::singleShot(0, buttons_.first()->parentWidget(), [alert = QPointer<Alert>(this)] {
+        if (!alert)
+            return;
+        for (QPushButton* button : std::as_const(alert->buttons_)) {
             auto* action =
                 static_cast<AlertAction*>(button->property("tamsel.action").value<void*>());
             if (action && action->style() != AlertAction::Style::Cancel) {
@@ -144,8 +151,8 @@ void Alert::buildButtons() {
                 return;
             }
         }
-        if (!buttons_.isEmpty())
-            buttons_.first()->setFocus();
+        if (!alert->buttons_.isEmpty())
+            alert->buttons_.first()->setFocus();
     });
 }
 
