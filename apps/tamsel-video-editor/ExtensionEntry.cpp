@@ -5,17 +5,17 @@
 
 using namespace platform;
 
-ExtensionEntry::ExtensionEntry(std::unique_ptr<ExtensionEndpoint> endpoint)
-    : endpoint_(std::move(endpoint)),
+ExtensionEntry::ExtensionEntry(ExtensionEndpoint& endpoint)
+    : endpoint_(endpoint),
       keyboard_(new EditorKeyboard(&window_, [this]() -> TXVideoEditorViewController* {
           return principal_ ? principal_->videoEditorViewController.get() : nullptr;
       })) {
     window_.setWindowTitle(QStringLiteral("Tamsel"));
     window_.resize(960, 600);
     window_.installEventFilter(this);
-    endpoint_->onRequest = [this](QList<ExtensionItem> items) { beginRequest(items); };
-    endpoint_->onDismiss = [this] { endRequest(); };
-    endpoint_->onHostGone = [this] { endRequest(); };
+    endpoint_.onRequest = [this](QList<ExtensionItem> items) { beginRequest(items); };
+    endpoint_.onDismiss = [this] { endRequest(); };
+    endpoint_.onHostGone = [this] { endRequest(); };
 }
 
 bool ExtensionEntry::eventFilter(QObject* watched, QEvent* event) {
@@ -31,13 +31,16 @@ bool ExtensionEntry::eventFilter(QObject* watched, QEvent* event) {
 
 ExtensionEntry::~ExtensionEntry() {
     endRequest();
+    endpoint_.onRequest = nullptr;
+    endpoint_.onDismiss = nullptr;
+    endpoint_.onHostGone = nullptr;
 }
 
 void ExtensionEntry::beginRequest(const QList<ExtensionItem>& inputItems) {
     if (principal_ || ended_)
         return; // one request per extension process
     auto connection = std::make_shared<AuxiliaryConnection>(
-        endpoint_->channel(), TXVideoEditorExtensionContext::_extensionAuxiliaryVendorProtocol(),
+        endpoint_.channel(), TXVideoEditorExtensionContext::_extensionAuxiliaryVendorProtocol(),
         TXVideoEditorExtensionContext::_extensionAuxiliaryHostProtocol());
     context_ = std::make_shared<TXVideoEditorExtensionContext>(inputItems, connection);
     principal_ = TXVideoEditorExtensionViewController::create();

@@ -14,10 +14,13 @@
 // own, with the editor's keyboard shortcuts. The window closing, the host
 // dismissing the editor and the host going away all end the request. Main
 // thread only.
+//
+// The endpoint outlives the entry (the process's way out runs through it);
+// the entry unhooks itself from it when it goes.
 class ExtensionEntry : public QObject {
     Q_OBJECT
   public:
-    explicit ExtensionEntry(std::unique_ptr<platform::ExtensionEndpoint> endpoint);
+    explicit ExtensionEntry(platform::ExtensionEndpoint& endpoint);
     ~ExtensionEntry() override;
 
     platform::Window& window() { return window_; }
@@ -42,7 +45,7 @@ class ExtensionEntry : public QObject {
     bool eventFilter(QObject* watched, QEvent* event) override;
 
   private:
-    std::unique_ptr<platform::ExtensionEndpoint> endpoint_;
+    platform::ExtensionEndpoint& endpoint_;
     platform::Window window_;
     EditorKeyboard* keyboard_; // belongs to the window
     std::shared_ptr<TXVideoEditorExtensionContext> context_;

@@ -5,8 +5,6 @@
 #include "DemoScript.h"
 #include "ExtensionEntry.h"
 #include "platform/runtime/DevicePaths.h"
-#include "platform/runtime/GlobalQueue.h"
-#include "platform/runtime/MainQueue.h"
 #include "platform/ui/Device.h"
 #include "support/FileManager.h"
 
@@ -60,7 +58,7 @@ int main(int argc, char** argv) {
 
     int status = 0;
     {
-        ExtensionEntry entry(std::move(endpoint));
+        ExtensionEntry entry(*endpoint);
         QObject::connect(&entry, &ExtensionEntry::ended, &app, &QCoreApplication::quit);
         std::unique_ptr<AutomationDriver> driver;
         if (script) {
@@ -78,9 +76,8 @@ int main(int argc, char** argv) {
     }
     // Work already queued (a removal, an album write) finishes first, and so
     // does work queued for the main thread, which may still hold the editor:
-    // it must go while the application is there.
-    platform::GlobalQueue::drain();
-    platform::MainQueue::runPending();
-    platform::GlobalQueue::drain();
+    // it must go while the application is there. The host hears meanwhile
+    // that the editor is still at it.
+    endpoint->finishQueuedWork();
     return status;
 }

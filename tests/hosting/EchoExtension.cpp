@@ -1,15 +1,20 @@
 // A stand-in extension for the launcher's tests: it answers a request with the
 // titles of its input items as activity types, ends when dismissed or when
-// the host goes away, and crashes on request.
+// the host goes away, and crashes on request. Dismissed, it can keep working
+// (--busy-after-dismiss MS: queued work that takes that long) or stop
+// answering altogether (--hang-after-dismiss).
 
 #include "platform/hosting/AuxiliaryConnection.h"
 #include "platform/hosting/ExtensionEndpoint.h"
+#include "platform/runtime/GlobalQueue.h"
 
 #include <QCoreApplication>
+#include <QThread>
 #include <cstdlib>
 
 int main(int argc, char** argv) {
     QCoreApplication app(argc, argv);
+    const QStringList arguments = app.arguments();
     auto endpoint = platform::ExtensionEndpoint::fromEnvironment();
     if (!endpoint->hasHost())
         return 3;
@@ -18,7 +23,7 @@ int main(int argc, char** argv) {
         platform::InterfaceDescription{"Host", {"extensionDidFinishWithActivityTypes:"}});
 
     endpoint->onRequest = [&](QList<platform::ExtensionItem> items) {
-        if (app.arguments().contains("--crash") || qEnvironmentVariableIsSet("TAMSEL_ECHO_CRASH"))
+        if (arguments.contains("--crash") || qEnvironmentVariableIsSet("TAMSEL_ECHO_CRASH"))
             std::abort();
         QStringList titles;
         for (const auto& item : items)
@@ -30,5 +35,14 @@ int main(int argc, char** argv) {
     endpoint->onHostGone = [&] { app.exit(7); };
     const int status = app.exec();
     connection->flush();
+
+    if (arguments.contains("--hang-after-dismiss"))
+        for (;;)
+            QThread::sleep(60);
+    if (const qsizetype at = arguments.indexOf("--busy-after-dismiss"); at >= 0)
+        platform::GlobalQueue::async(
+            platform::QueuePriority::Default,
+            [ms = arguments.value(at + 1).toULong()] { QThread::msleep(ms); });
+    endpoint->finishQueuedWork(100);
     return status;
 }

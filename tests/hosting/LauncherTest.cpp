@@ -68,3 +68,25 @@ TEST(ExtensionLauncher, ReportsAProgramThatCannotStart) {
     EXPECT_FALSE(run.launcher.start("/nonexistent/extension", {}, {}, &error));
     EXPECT_FALSE(error.isEmpty());
 }
+
+TEST(ExtensionLauncher, WaitsForQueuedWorkThatOutlastsTheGrace) {
+    LauncherRun run;
+    // The work takes five times the grace; the extension says it is at it.
+    ASSERT_TRUE(
+        run.launcher.start(echoExtension(), {"--busy-after-dismiss", "1500"}, items({"A"})));
+    ASSERT_TRUE(waitUntil([&] { return !run.reports.isEmpty(); }));
+    run.launcher.dismiss(300);
+    ASSERT_TRUE(waitUntil([&] { return run.ended.has_value(); }));
+    EXPECT_EQ(run.ended->first, 0);
+    EXPECT_FALSE(run.ended->second) << "killed while its queued work ran";
+}
+
+TEST(ExtensionLauncher, KillsADismissedExtensionThatFallsSilent) {
+    LauncherRun run;
+    ASSERT_TRUE(run.launcher.start(echoExtension(), {"--hang-after-dismiss"}, items({"A"})));
+    ASSERT_TRUE(waitUntil([&] { return !run.reports.isEmpty(); }));
+    run.launcher.dismiss(300);
+    ASSERT_TRUE(waitUntil([&] { return run.ended.has_value(); }));
+    EXPECT_TRUE(run.ended->second);
+    EXPECT_EQ(run.launcher.process().exitStatus(), QProcess::CrashExit);
+}

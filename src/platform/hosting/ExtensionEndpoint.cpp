@@ -1,8 +1,11 @@
 #include "ExtensionEndpoint.h"
 
 #include "HostMessages.h"
+#include "platform/runtime/GlobalQueue.h"
+#include "platform/runtime/MainQueue.h"
 
 #include <QCborArray>
+#include <QTimer>
 
 namespace platform {
 
@@ -35,6 +38,35 @@ ExtensionEndpoint::ExtensionEndpoint(std::shared_ptr<MessageChannel> channel)
         if (onHostGone)
             onHostGone();
     };
+}
+
+ExtensionEndpoint::~ExtensionEndpoint() {
+    // The channel may outlive this endpoint (the connection to the host holds
+    // it while its last messages leave), and the final drain still turns the
+    // event loop: a message or a hang-up arriving then must find no callback
+    // that leads back here.
+    if (channel_) {
+        channel_->onMessage = nullptr;
+        channel_->onClosed = nullptr;
+    }
+}
+
+void ExtensionEndpoint::finishQueuedWork(int heartbeatMs) {
+    QTimer heartbeat;
+    if (channel_) {
+        const std::weak_ptr<MessageChannel> channel = channel_;
+        QObject::connect(&heartbeat, &QTimer::timeout, [channel] {
+            if (const auto open = channel.lock(); open && open->isOpen())
+                open->send(QCborMap{{QStringLiteral("type"), HostMessages::Working}});
+        });
+        heartbeat.start(heartbeatMs);
+    }
+    // Work on the main queue may queue more for the workers (an editor's last
+    // owner letting go removes its clip), and the workers may wait on the
+    // main queue: hence both, twice.
+    GlobalQueue::drain();
+    MainQueue::runPending();
+    GlobalQueue::drain();
 }
 
 } // namespace platform

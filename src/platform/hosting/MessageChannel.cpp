@@ -1,8 +1,7 @@
 #include "MessageChannel.h"
 
-#include <QCborValue>
+#include <QPointer>
 #include <QSocketNotifier>
-#include <QtEndian>
 #include <cerrno>
 #include <sys/socket.h>
 #include <unistd.h>
@@ -46,10 +45,7 @@ void MessageChannel::close() {
 }
 
 ErrorPtr MessageChannel::send(const QCborMap& message) {
-    const QByteArray payload = message.toCborValue().toCbor();
-    QByteArray frame(4, '\0');
-    qToBigEndian<quint32>(quint32(payload.size()), frame.data());
-    frame += payload;
+    const QByteArray frame = MessageFrameReader::frame(message);
 
     std::lock_guard lock(sendMutex_);
     if (closed_)
@@ -78,26 +74,25 @@ void MessageChannel::readAvailable() {
         closeFromPeer();
         return;
     }
-    buffer_.append(chunk, n);
+    reader_.append(chunk, n);
 
-    // Deliver every whole frame; a callback may close the channel midway.
-    while (buffer_.size() >= 4 && isOpen()) {
-        const quint32 length = qFromBigEndian<quint32>(buffer_.constData());
-        if (length > MaximumMessageSize) {
+    // Deliver every whole message. A callback may close the channel midway,
+    // or let go of it: nothing here touches it after it is gone.
+    const QPointer<MessageChannel> self(this);
+    while (self && isOpen()) {
+        QCborMap message;
+        switch (reader_.next(&message)) {
+        case MessageFrameReader::Result::NeedMore:
+            return;
+        case MessageFrameReader::Result::Malformed:
             closeFromPeer();
             return;
+        case MessageFrameReader::Result::Message:
+            // A copy: the callback may replace the channel's own.
+            if (auto handler = onMessage)
+                handler(message);
+            break;
         }
-        if (buffer_.size() < 4 + qsizetype(length))
-            return;
-        QCborParserError error;
-        const QCborValue value = QCborValue::fromCbor(buffer_.mid(4, length), &error);
-        buffer_.remove(0, 4 + length);
-        if (error.error != QCborError::NoError || !value.isMap()) {
-            closeFromPeer();
-            return;
-        }
-        if (onMessage)
-            onMessage(value.toMap());
     }
 }
 
@@ -105,8 +100,8 @@ void MessageChannel::closeFromPeer() {
     if (!isOpen())
         return;
     close();
-    if (onClosed)
-        onClosed();
+    if (auto handler = onClosed)
+        handler();
 }
 
 } // namespace platform

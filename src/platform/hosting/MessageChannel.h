@@ -1,5 +1,6 @@
 #pragma once
 
+#include "MessageFrameReader.h"
 #include "platform/runtime/Error.h"
 
 #include <QCborMap>
@@ -23,7 +24,7 @@ namespace platform {
 class MessageChannel : public QObject {
     Q_OBJECT
   public:
-    static constexpr qint64 MaximumMessageSize = 16 * 1024 * 1024;
+    static constexpr qint64 MaximumMessageSize = MessageFrameReader::MaximumMessageSize;
 
     explicit MessageChannel(int socketDescriptor, QObject* parent = nullptr);
     ~MessageChannel() override;
@@ -45,7 +46,7 @@ class MessageChannel : public QObject {
 
     int fd_;
     QSocketNotifier* notifier_ = nullptr;
-    QByteArray buffer_;
+    MessageFrameReader reader_;
     mutable std::mutex sendMutex_;
     bool closed_ = false;
 };

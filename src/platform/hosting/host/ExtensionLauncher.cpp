@@ -3,8 +3,6 @@
 #include "platform/hosting/HostMessages.h"
 #include "platform/hosting/MessageChannel.h"
 
-#include <QCborArray>
-#include <QTimer>
 #include <unistd.h>
 
 namespace platform {
@@ -14,8 +12,14 @@ constexpr int kChildDescriptor = 3;
 } // namespace
 
 ExtensionLauncher::ExtensionLauncher(QObject* parent) : QObject(parent) {
+    killTimer_.setSingleShot(true);
+    connect(&killTimer_, &QTimer::timeout, this, [this] {
+        if (process_.state() != QProcess::NotRunning)
+            process_.kill();
+    });
     connect(&process_, &QProcess::finished, this,
             [this](int exitCode, QProcess::ExitStatus status) {
+                killTimer_.stop();
                 if (channel_)
                     channel_->close();
                 emit extensionEnded(exitCode, status != QProcess::NormalExit || exitCode != 0);
@@ -23,6 +27,10 @@ ExtensionLauncher::ExtensionLauncher(QObject* parent) : QObject(parent) {
 }
 
 ExtensionLauncher::~ExtensionLauncher() {
+    if (channel_) {
+        channel_->onMessage = nullptr;
+        channel_->onClosed = nullptr;
+    }
     if (process_.state() != QProcess::NotRunning) {
         process_.kill();
         process_.waitForFinished(2000);
@@ -39,17 +47,11 @@ bool ExtensionLauncher::start(const QString& program, const QStringList& argumen
     }
     channel_ = std::make_shared<MessageChannel>(hostEnd);
     channel_->onMessage = [this](const QCborMap& message) {
-        if (message.value(QStringLiteral("type")).toString() != HostMessages::Invoke)
-            return;
-        if (message.value(QStringLiteral("selector")).toString() !=
-            QLatin1String("extensionDidFinishWithActivityTypes:"))
-            return;
-        QStringList types;
-        for (const QCborValue& type :
-             message.value(QStringLiteral("arguments")).toArray().at(0).toArray())
-            if (type.isString())
-                types.append(type.toString());
-        emit extensionDidFinishWithActivityTypes(types);
+        // A dismissed extension that still speaks is still alive.
+        if (killTimer_.isActive())
+            killTimer_.start();
+        if (const auto types = HostMessages::activityTypesOfReport(message))
+            emit extensionDidFinishWithActivityTypes(*types);
     };
 
     QProcessEnvironment environment = process_.processEnvironment().isEmpty()
@@ -81,10 +83,7 @@ void ExtensionLauncher::dismiss(int graceMs) {
         channel_->send(QCborMap{{QStringLiteral("type"), HostMessages::Dismiss}});
     if (process_.state() == QProcess::NotRunning)
         return;
-    QTimer::singleShot(graceMs, this, [this] {
-        if (process_.state() != QProcess::NotRunning)
-            process_.kill();
-    });
+    killTimer_.start(graceMs);
 }
 
 bool ExtensionLauncher::isRunning() const {

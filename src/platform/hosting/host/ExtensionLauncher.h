@@ -5,6 +5,7 @@
 #include <QObject>
 #include <QProcess>
 #include <QStringList>
+#include <QTimer>
 #include <memory>
 
 namespace platform {
@@ -26,8 +27,10 @@ class ExtensionLauncher : public QObject {
     bool start(const QString& program, const QStringList& arguments,
                const QList<ExtensionItem>& inputItems, QString* error = nullptr);
 
-    // The host closes the extension: it is asked to end, and killed when it
-    // has not ended within `graceMs`.
+    // The host closes the extension: it is asked to end, and given the time
+    // its queued work takes (an album write of a large recording may take
+    // minutes); it is killed only when it has fallen silent for `graceMs`,
+    // neither ending nor saying it is still at work.
     void dismiss(int graceMs = 10000);
 
     bool isRunning() const;
@@ -43,6 +46,7 @@ class ExtensionLauncher : public QObject {
   private:
     QProcess process_;
     std::shared_ptr<MessageChannel> channel_;
+    QTimer killTimer_; // runs from the dismissal on; each word from the extension restarts it
 };
 
 } // namespace platform
