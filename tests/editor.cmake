@@ -29,3 +29,9 @@ tamsel_add_tests(tamsel_editor_keyboard_tests unit
   SOURCES unit/editor/EditorOnFakes.cpp editor/EditorKeyboardTest.cpp
   LIBS tamsel_extension_app tamsel_test_fakes
   MAIN tamsel_ui_test_main)
+
+# Hostile input, faults and the way out, through the whole product.
+tamsel_add_tests(tamsel_hardening_tests integration
+  SOURCES editor/EndToEndFixture.cpp editor/HostileInputTest.cpp
+  LIBS tamsel_platform_media tamsel_media_generator)
+add_dependencies(tamsel_hardening_tests tamsel-edit tamsel-video-editor)

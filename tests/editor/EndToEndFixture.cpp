@@ -80,7 +80,8 @@ EndToEnd::Run EndToEnd::edit(const QString& script, const QString& movie, const 
     for (const QString& key : env.keys())
         environment.insert(key, env.value(key));
     process.setProcessEnvironment(environment);
-    const QStringList program = xvfbCommand_.isEmpty() ? command(QString(), QSize()) : xvfbCommand_;
+    const QStringList program =
+        launchPrefix + (xvfbCommand_.isEmpty() ? command(QString(), QSize()) : xvfbCommand_);
     process.start(program.first(),
                   program.mid(1) +
                       QStringList{movie.isEmpty() ? recording() : movie, "--app-name", "Racer",

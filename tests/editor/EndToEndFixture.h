@@ -41,6 +41,8 @@ class EndToEnd : public ::testing::Test {
     static QTemporaryDir* dir;
     QTemporaryDir mobile;
     QTemporaryDir album;
+    // A command that tamsel-edit runs under (prlimit ..., say); none when empty.
+    QStringList launchPrefix;
 
   private:
     QStringList xvfbCommand_;

@@ -16,13 +16,27 @@ namespace platform {
 //
 // Any other path is a host path and passes unchanged. The environment is read
 // on every call, so tests can point the roots at temporary directories.
+//
+// A device path never leads out of its root, whatever the system code put in
+// it: ".." steps stop at the root, and a NUL (which would cut the host path
+// short) becomes U+2400. The framework's temporary store,
+// "/private/var/mobile/Library/Tamsel", holds files only: whatever follows it
+// in a path is the name of one entry of it, "/" and all. So "AC/DC_1.mp4"
+// there is the one file "AC∕DC_1.mp4" (a division slash), "../x" the file
+// "..∕x", and a name too long for the file system is shortened to one
+// that keeps its beginning, a digest of the whole and its end. The mapping is
+// idempotent: a host name read back from a listing maps to itself.
 namespace DevicePaths {
 
 QString mobileRoot(); // host directory, no trailing slash
 QString systemRoot(); // host directory, no trailing slash
 
-// Device path to host path. "" stays "".
+// Device path to host path, confined as above. "" stays "".
 QString toHost(const QString& path);
+
+// The longest entry name, in UTF-8 bytes, that a confined folder gets; room
+// is left for the temporary names that writers derive from it.
+inline constexpr int MaximumEntryNameBytes = 200;
 
 // Host path to device path: the inverse of toHost for paths under one of the
 // roots, unchanged otherwise.

@@ -90,13 +90,24 @@ bool mayShare(const QString& hostPath) {
     return DevicePaths::toDevice(hostPath).startsWith(QLatin1String("/private/var/mobile/"));
 }
 
-// "clip.mp4", "clip 2.mp4", "clip 3.mp4" ...
+// "clip.mp4", "clip 2.mp4", "clip 3.mp4" ... A name that starts with a dot
+// would hide the video from the user's file manager, so the dots go.
 QString candidateName(const QFileInfo& source, int attempt) {
+    QString name = source.fileName();
+    qsizetype dots = 0;
+    while (dots < name.size() && name.at(dots) == QLatin1Char('.'))
+        ++dots;
+    if (dots > 0) {
+        name = name.mid(dots);
+        // ".mp4" keeps its extension: "Video.mp4".
+        if (!name.contains(QLatin1Char('.')))
+            name = QStringLiteral("Video") + (name.isEmpty() ? QString() : QLatin1Char('.') + name);
+    }
     if (attempt == 1)
-        return source.fileName();
-    const QString suffix =
-        source.suffix().isEmpty() ? QString() : QLatin1Char('.') + source.suffix();
-    return QStringLiteral("%1 %2%3").arg(source.completeBaseName()).arg(attempt).arg(suffix);
+        return name;
+    const QFileInfo named(name);
+    const QString suffix = named.suffix().isEmpty() ? QString() : QLatin1Char('.') + named.suffix();
+    return QStringLiteral("%1 %2%3").arg(named.completeBaseName()).arg(attempt).arg(suffix);
 }
 
 } // namespace

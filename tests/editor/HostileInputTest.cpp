@@ -1,0 +1,105 @@
+// What a host may send that it should not: application names that are paths,
+// a movie behind a symbolic link, an attachment that is not there. Every file
+// the editor writes or removes stays in the temporary store and the album,
+// and the clip is saved all the same.
+
+#include "EndToEndFixture.h"
+#include "platform/media/Asset.h"
+
+#include <QDir>
+#include <QDirIterator>
+#include <QFile>
+#include <QUrl>
+
+namespace {
+
+const QByteArray kSaved = "[\"org.tamsel.activity.SaveToAlbum\"]";
+
+const char* kTrimmedSave = R"(
+wait ready
+drag end 3
+tap trimButton
+wait exporting=false 60
+tap doneButton
+)";
+
+// Every file under `path`, recursively, hidden ones too.
+QStringList filesUnder(const QString& path) {
+    QStringList out;
+    QDirIterator it(path, QDir::Files | QDir::Hidden | QDir::System, QDirIterator::Subdirectories);
+    while (it.hasNext())
+        out.append(it.next());
+    return out;
+}
+
+} // namespace
+
+class HostileInput : public EndToEnd {
+  protected:
+    QString store() const { return mobile.filePath("Library/Tamsel"); }
+
+    // The album holds exactly one whole clip of about three seconds.
+    void expectOneClipInTheAlbum(const std::string& context) {
+        ASSERT_EQ(albumFiles().size(), 1)
+            << context << ": " << albumFiles().join(", ").toStdString();
+        const QString name = albumFiles().first();
+        EXPECT_FALSE(name.startsWith('.'))
+            << context << ": hidden in the album: " << name.toStdString();
+        const auto clip = platform::Asset::assetWithURL(QUrl::fromLocalFile(album.filePath(name)));
+        ASSERT_TRUE(clip->isPlayable()) << context;
+        EXPECT_NEAR(clip->duration().seconds(), 3.0, 0.2) << context;
+    }
+};
+
+TEST_F(HostileInput, ApplicationNamesThatArePathsStayInTheStoreAndStillSave) {
+    QTemporaryDir outside; // where a name's ".." steps would lead
+    ASSERT_TRUE(QDir().mkpath(store()));
+    const QString climb = QDir(store()).relativeFilePath(outside.filePath("evil"));
+    ASSERT_TRUE(climb.startsWith("../"));
+    const QStringList names = {"AC/DC", climb, "...", QString(4096, 'x'), "/", "a/../../b"};
+    for (const QString& name : names) {
+        const std::string context = name.left(40).toStdString();
+        const Run run = edit(kTrimmedSave, {}, {"--app-name", name});
+        ASSERT_EQ(run.exitCode, 0) << context << "\n" << run.err.toStdString();
+        EXPECT_EQ(run.hostReport, kSaved) << context;
+        EXPECT_TRUE(filesUnder(outside.path()).isEmpty()) << context;
+        expectOneClipInTheAlbum(context);
+        EXPECT_TRUE(filesUnder(store()).isEmpty())
+            << context << ": left behind " << filesUnder(store()).join(", ").toStdString();
+        // Nothing beside the store either: only its own folder is in Library.
+        EXPECT_EQ(QDir(mobile.filePath("Library"))
+                      .entryList(QDir::AllEntries | QDir::NoDotAndDotDot | QDir::Hidden),
+                  QStringList{"Tamsel"})
+            << context;
+        for (const QString& file : albumFiles())
+            QFile::remove(album.filePath(file));
+    }
+}
+
+TEST_F(HostileInput, AMovieBehindALinkAndAnAttachmentThatIsNotThere) {
+    // The recording sits in a folder the editor has no business writing to;
+    // the host names it through a symbolic link.
+    QTemporaryDir elsewhere;
+    const QString readOnly = elsewhere.filePath("recordings");
+    ASSERT_TRUE(QDir().mkpath(readOnly));
+    ASSERT_TRUE(QFile::copy(recording(), readOnly + "/recording.mp4"));
+    QFile::setPermissions(readOnly, QFileDevice::ReadOwner | QFileDevice::ExeOwner);
+    const QString link = elsewhere.filePath("link.mp4");
+    ASSERT_TRUE(QFile::link(readOnly + "/recording.mp4", link));
+    const QByteArray original = hashOf(readOnly + "/recording.mp4");
+
+    const Run run = edit(QString(kTrimmedSave).replace("tap doneButton", R"(tap shareButton
+share cancel
+tap doneButton)"),
+                         link, {"--attachment", elsewhere.filePath("no/such/file.mov")});
+    QFile::setPermissions(readOnly,
+                          QFileDevice::ReadOwner | QFileDevice::WriteOwner | QFileDevice::ExeOwner);
+    ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
+    EXPECT_EQ(run.hostReport, kSaved);
+    EXPECT_EQ(hashOf(readOnly + "/recording.mp4"), original)
+        << "the host's movie is never modified";
+    EXPECT_EQ(QDir(readOnly).entryList(QDir::AllEntries | QDir::NoDotAndDotDot | QDir::Hidden),
+              QStringList{"recording.mp4"});
+    expectOneClipInTheAlbum("through a link");
+    EXPECT_TRUE(filesUnder(store()).isEmpty());
+}
