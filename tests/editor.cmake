@@ -32,6 +32,7 @@ tamsel_add_tests(tamsel_editor_keyboard_tests unit
 
 # Hostile input, faults and the way out, through the whole product.
 tamsel_add_tests(tamsel_hardening_tests integration
-  SOURCES editor/EndToEndFixture.cpp editor/HostileInputTest.cpp
+  SOURCES editor/EndToEndFixture.cpp editor/HostileInputTest.cpp editor/FaultsEndToEndTest.cpp
+    editor/RepeatedUseTest.cpp
   LIBS tamsel_platform_media tamsel_media_generator)
 add_dependencies(tamsel_hardening_tests tamsel-edit tamsel-video-editor)

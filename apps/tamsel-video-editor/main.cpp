@@ -11,10 +11,14 @@
 #include <QApplication>
 #include <QFile>
 #include <QTimer>
+#include <csignal>
 #include <cstdio>
 #include <optional>
 
 int main(int argc, char** argv) {
+    // A file that outgrows the size limit set on this process must fail the
+    // write that crosses the limit, as a full disk does, not end the editor.
+    std::signal(SIGXFSZ, SIG_IGN);
     // Without a display the editor still runs (for automation), offscreen.
     const bool headless = qEnvironmentVariableIsEmpty("DISPLAY") &&
                           qEnvironmentVariableIsEmpty("WAYLAND_DISPLAY") &&

@@ -3,6 +3,7 @@
 
 #include "MediaGenerator.h"
 #include "platform/runtime/GlobalQueue.h"
+#include "platform/services/FileSystem.h"
 #include "platform/services/album/FolderPhotoAlbum.h"
 #include "support/TempDir.h"
 #include "support/Wait.h"
@@ -14,6 +15,7 @@
 #include <atomic>
 #include <gtest/gtest.h>
 #include <linux/fs.h>
+#include <mutex>
 #include <sys/ioctl.h>
 #include <sys/resource.h>
 #include <sys/stat.h>
@@ -206,6 +208,43 @@ TEST_F(PhotoAlbumTest, TheSharedAlbumIsOneAlbumInTheFolderOfItsFirstUse) {
     PhotoAlbum::sharedAlbum()->saveVideoAtPathToAlbum(movie());
     GlobalQueue::drain();
     EXPECT_EQ(entries(folder), QStringList{"clip.mp4"});
+}
+
+TEST_F(PhotoAlbumTest, ARemovalAskedAfterASaveWaitsUntilTheImportHasTheFile) {
+    // The editor's tear-down removes its clip right after asking the album to
+    // save it; the removal runs on another queue and must not win.
+    const QString clip = albumRoot.filePath("Racer_1.mp4");
+    ASSERT_TRUE(QFile::copy(movie(), clip));
+    // Every worker of the album's queue busy, so the import has to wait.
+    std::mutex gate;
+    std::unique_lock closed(gate);
+    for (int i = 0; i < 64; ++i)
+        GlobalQueue::async(QueuePriority::Default, [&gate] { std::lock_guard pass(gate); });
+    album.saveVideoAtPathToAlbum(clip);
+    std::atomic<bool> removed{false};
+    GlobalQueue::async(QueuePriority::Background, [&] {
+        FileSystem::local()->removeItemAtPath(clip, nullptr);
+        removed = true;
+    });
+    EXPECT_FALSE(waitUntil([&] { return removed.load(); }, 300)) << "the removal overtook";
+    closed.unlock();
+    GlobalQueue::drain();
+    EXPECT_TRUE(removed);
+    EXPECT_FALSE(QFile::exists(clip));
+    EXPECT_EQ(entries(folder), QStringList{"Racer_1.mp4"});
+    EXPECT_EQ(hashOf(folder + "/Racer_1.mp4"), hashOf(movie()));
+}
+
+TEST_F(PhotoAlbumTest, APipeOrADeviceIsRefusedWithoutWaitingOnIt) {
+    const QString fifo = albumRoot.filePath("recording.mp4");
+    ASSERT_EQ(::mkfifo(fifo.toLocal8Bit().constData(), 0600), 0);
+    for (const QString& path : {fifo, QStringLiteral("/dev/zero"), albumRoot.path()}) {
+        ErrorPtr error;
+        EXPECT_TRUE(album.importVideo(path, &error).isEmpty()) << path.toStdString();
+        ASSERT_TRUE(error) << path.toStdString();
+        EXPECT_EQ(error->code(), PhotoAlbum::NotVideo);
+    }
+    EXPECT_TRUE(entries(folder).isEmpty());
 }
 
 TEST_F(PhotoAlbumTest, ANameThatStartsWithADotIsNotHiddenInTheAlbum) {

@@ -12,6 +12,7 @@
 #include <QRandomGenerator>
 
 #include <cerrno>
+#include <csignal>
 #include <cstdio>
 
 namespace platform {
@@ -135,6 +136,9 @@ void MovieExportSession::cancelExport() {
 }
 
 void MovieExportSession::run(std::function<void()> handler) {
+    // A size limit on this process would kill it on the first byte too many;
+    // ignored, the write fails and the export with it, as on a full disk.
+    std::signal(SIGXFSZ, SIG_IGN);
     if (cancelled_) {
         finish(ExportSessionStatus::Cancelled, nullptr);
     } else {

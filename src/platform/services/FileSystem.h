@@ -48,7 +48,8 @@ class FileSystem {
     virtual std::optional<FileSystemAttributes>
     attributesOfFileSystemForPath(const QString& path, ErrorPtr* error) const = 0;
 
-    // Removes a file, or a directory with everything in it.
+    // Removes a file, or a directory with everything in it, once the reads
+    // of it already asked for have it open (FileHolds).
     virtual bool removeItemAtPath(const QString& path, ErrorPtr* error) = 0;
 
     // Moves (renames) `from` to `to`; fails when `to` exists. Crosses file

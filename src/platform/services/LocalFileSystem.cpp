@@ -1,5 +1,6 @@
 #include "LocalFileSystem.h"
 
+#include "FileHolds.h"
 #include "platform/runtime/DevicePaths.h"
 
 #include <cerrno>
@@ -107,7 +108,12 @@ LocalFileSystem::attributesOfFileSystemForPath(const QString& path, ErrorPtr* er
 
 bool LocalFileSystem::removeItemAtPath(const QString& path, ErrorPtr* error) {
     std::error_code ec;
-    const fs::path host(hostBytes(path).toStdString());
+    const QByteArray hostPath = hostBytes(path);
+    // A read of the file asked for earlier (the album importing it) goes
+    // first; removals run on worker threads, so waiting here blocks no one
+    // the reader needs.
+    FileHolds::waitForRelease(QString::fromLocal8Bit(hostPath));
+    const fs::path host(hostPath.toStdString());
     if (!fs::exists(fs::symlink_status(host, ec))) {
         setError(error, posixError(ENOENT, path));
         return false;

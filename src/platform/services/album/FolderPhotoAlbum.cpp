@@ -4,6 +4,7 @@
 #include "platform/runtime/DevicePaths.h"
 #include "platform/runtime/GlobalQueue.h"
 #include "platform/runtime/Log.h"
+#include "platform/services/FileHolds.h"
 
 #include <QDir>
 #include <QFile>
@@ -144,9 +145,21 @@ QString FolderPhotoAlbum::lastSavedPath() const {
     return *lastSaved_;
 }
 
-QString FolderPhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error) {
+QString FolderPhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error,
+                                      std::shared_ptr<void> hold) {
     const QString source = DevicePaths::toHost(devicePath);
-    const auto asset = Asset::assetWithURL(QUrl::fromLocalFile(source));
+    // Opened first, without waiting on a pipe or a device: from here on a
+    // removal of the name cannot take the bytes away, and the hold goes.
+    Descriptor in;
+    in.fd = ::open(source.toLocal8Bit().constData(), O_RDONLY | O_CLOEXEC | O_NONBLOCK);
+    hold.reset();
+    struct stat st;
+    if (in.fd < 0 || ::fstat(in.fd, &st) != 0 || !S_ISREG(st.st_mode)) {
+        setError(error, albumError(NotVideo, QStringLiteral("%1 cannot be read").arg(devicePath)));
+        return {};
+    }
+    const auto asset =
+        Asset::assetWithURL(QUrl::fromLocalFile(QStringLiteral("/proc/self/fd/%1").arg(in.fd)));
     if (asset->tracksWithMediaType(MediaType::Video).isEmpty() || !asset->isPlayable()) {
         setError(error, albumError(NotVideo,
                                    QStringLiteral("%1 is not a playable video").arg(devicePath)));
@@ -154,13 +167,6 @@ QString FolderPhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error
     }
     if (!QDir().mkpath(folder_) || !QFileInfo(folder_).isDir()) {
         setError(error, errorForErrno(ENOTDIR, folder_));
-        return {};
-    }
-
-    Descriptor in;
-    in.fd = ::open(source.toLocal8Bit().constData(), O_RDONLY | O_CLOEXEC);
-    if (in.fd < 0) {
-        setError(error, albumError(NotVideo, QStringLiteral("%1 cannot be read").arg(devicePath)));
         return {};
     }
     const QByteArray folder = folder_.toLocal8Bit();
@@ -241,22 +247,25 @@ QString FolderPhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error
 
 void FolderPhotoAlbum::performChanges_creationRequestForAssetFromVideoAtFileURL(
     const QUrl& fileURL, Completion completion) {
-    GlobalQueue::async(QueuePriority::Default, [album = *this, fileURL,
+    const QString path = fileURL.isLocalFile() ? fileURL.toLocalFile() : fileURL.toString();
+    GlobalQueue::async(QueuePriority::Default, [album = *this, path,
+                                                hold = FileHolds::hold(DevicePaths::toHost(path)),
                                                 completion = std::move(completion)]() mutable {
         ErrorPtr error;
-        const QString path = fileURL.isLocalFile() ? fileURL.toLocalFile() : fileURL.toString();
-        const bool saved = !album.importVideo(path, &error).isEmpty();
+        const bool saved = !album.importVideo(path, &error, std::move(hold)).isEmpty();
         if (completion)
             completion(saved, error);
     });
 }
 
 void FolderPhotoAlbum::saveVideoAtPathToAlbum(const QString& path) {
-    GlobalQueue::async(QueuePriority::Default, [album = *this, path]() mutable {
-        ErrorPtr error;
-        if (album.importVideo(path, &error).isEmpty())
-            logError(QStringLiteral("photo album: %1").arg(error->description()));
-    });
+    GlobalQueue::async(
+        QueuePriority::Default,
+        [album = *this, path, hold = FileHolds::hold(DevicePaths::toHost(path))]() mutable {
+            ErrorPtr error;
+            if (album.importVideo(path, &error, std::move(hold)).isEmpty())
+                logError(QStringLiteral("photo album: %1").arg(error->description()));
+        });
 }
 
 } // namespace platform

@@ -1,0 +1,222 @@
+// Faults on the way: a full disk, an album that cannot be written, a host or
+// an extension killed at the worst moment, the host ending the editor right
+// after a save. Each ends with nothing lost and nothing partial: the
+// recording untouched, no clip left half-written in the album or the
+// temporary store.
+
+#include "EndToEndFixture.h"
+#include "MediaGenerator.h"
+#include "platform/media/Asset.h"
+#include "support/ProcessProbe.h"
+
+#include <QCoreApplication>
+#include <QDir>
+#include <QFile>
+#include <QProcess>
+#include <QStorageInfo>
+#include <QUrl>
+#include <csignal>
+#include <sys/stat.h>
+
+using testing_support::childOf;
+using testing_support::pollUntil;
+using testing_support::processEnded;
+
+namespace {
+
+QProcessEnvironment environmentWith(const QString& name, const QString& value) {
+    QProcessEnvironment environment;
+    environment.insert(name, value);
+    return environment;
+}
+
+const QByteArray kSaved = "[\"org.tamsel.activity.SaveToAlbum\"]";
+
+// A recording made longer by a free box of `padding` bytes at its end, which
+// players skip: a large file that is quick to make.
+bool writeLargeRecording(const QString& path, const QString& from, qint64 padding) {
+    if (!QFile::copy(from, path))
+        return false;
+    QFile file(path);
+    if (!file.open(QIODevice::Append))
+        return false;
+    QByteArray header(8, '\0');
+    const quint32 size = quint32(padding);
+    for (int i = 0; i < 4; ++i)
+        header[i] = char(size >> (24 - 8 * i));
+    header.replace(4, 4, "free");
+    file.write(header);
+    const QByteArray block(1 << 20, '\0');
+    for (qint64 left = padding - 8; left > 0; left -= block.size())
+        if (file.write(block.constData(), qMin<qint64>(left, block.size())) < 0)
+            return false;
+    return file.flush();
+}
+
+} // namespace
+
+class Faults : public EndToEnd {
+  protected:
+    QString store() const { return mobile.filePath("Library/Tamsel"); }
+
+    // Starts tamsel-edit on its own, for tests that kill one side.
+    void startHost(QProcess& host, const QString& movie, const QString& script) {
+        const QString scriptPath = mobile.filePath("script.txt");
+        QFile file(scriptPath);
+        ASSERT_TRUE(file.open(QIODevice::WriteOnly));
+        file.write(script.toUtf8());
+        file.close();
+        QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+        environment.insert("TAMSEL_MOBILE_ROOT", mobile.path());
+        environment.insert("TAMSEL_ALBUM_DIR", album.path());
+        environment.insert("TAMSEL_AUDIO", "null");
+        environment.insert("QT_QPA_PLATFORM", "offscreen");
+        host.setProcessEnvironment(environment);
+        host.start(QCoreApplication::applicationDirPath() + "/tamsel-edit",
+                   {movie, "--automation", scriptPath});
+        ASSERT_TRUE(host.waitForStarted());
+    }
+
+    // Either nothing in the album, or whole clips only: each one opens and
+    // lasts about `seconds`; nothing hidden, no temporary name.
+    void expectWholeClipsOnly(double seconds) {
+        for (const QString& name : albumFiles()) {
+            EXPECT_FALSE(name.startsWith('.')) << "a partial import: " << name.toStdString();
+            const auto clip =
+                platform::Asset::assetWithURL(QUrl::fromLocalFile(album.filePath(name)));
+            EXPECT_TRUE(clip->isPlayable()) << name.toStdString();
+            EXPECT_NEAR(clip->duration().seconds(), seconds, 0.2) << name.toStdString();
+        }
+    }
+
+    QStringList storeEntries() const {
+        return QDir(store()).entryList(QDir::AllEntries | QDir::Hidden | QDir::NoDotAndDotDot);
+    }
+};
+
+TEST_F(Faults, ADiskThatFillsUpMidExportLeavesNothingBehind) {
+    // A file size limit stands in for the full disk: the write that crosses
+    // it fails as it would on a full one, at once and on any file system.
+    const QByteArray original = hashOf(recording());
+    launchPrefix = {"prlimit", "--fsize=30000"};
+    // After a failed export the editor stays in trimming, undo disabled: the
+    // user closes the window.
+    const Run run = edit("wait ready\ndrag end 9\ntap trimButton\nwait log \"Export Trim Video\" "
+                         "60\ndismiss\n",
+                         {}, {}, environmentWith("TAMSEL_LOG_STDERR", "1"));
+    ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
+    EXPECT_TRUE(run.err.contains("TQVideoEditorViewController: Export Trim Video Failed, due to "
+                                 "error: "))
+        << run.err.toStdString();
+    EXPECT_EQ(run.hostReport, "[]");
+    EXPECT_TRUE(storeEntries().isEmpty()) << storeEntries().join(", ").toStdString();
+    EXPECT_TRUE(albumFiles().isEmpty());
+    EXPECT_EQ(hashOf(recording()), original);
+}
+
+TEST_F(Faults, AnAlbumThatCannotBeWrittenLosesNothing) {
+    // Where the album folder should be, there is a file.
+    QFile blocker(mobile.filePath("not-a-folder"));
+    ASSERT_TRUE(blocker.open(QIODevice::WriteOnly));
+    blocker.close();
+    const QProcessEnvironment env = [&] {
+        QProcessEnvironment e;
+        e.insert("TAMSEL_ALBUM_DIR", blocker.fileName() + "/Screen Recordings");
+        e.insert("TAMSEL_LOG_STDERR", "1");
+        return e;
+    }();
+    const QByteArray original = hashOf(recording());
+
+    const Run trimmed = edit("wait ready\ndrag end 4\ntap trimButton\nwait exporting=false "
+                             "60\nwait log \"photo album\" 30\ntap doneButton\n",
+                             {}, {}, env);
+    ASSERT_EQ(trimmed.exitCode, 0) << trimmed.err.toStdString();
+    EXPECT_TRUE(trimmed.err.contains("photo album: ")) << trimmed.err.toStdString();
+    EXPECT_TRUE(storeEntries().isEmpty()) << storeEntries().join(", ").toStdString();
+
+    const Run untrimmed = edit("wait ready\ntap saveButton\n", {}, {}, env);
+    ASSERT_EQ(untrimmed.exitCode, 0) << untrimmed.err.toStdString();
+    EXPECT_EQ(untrimmed.hostReport, kSaved);
+    EXPECT_TRUE(untrimmed.err.contains("Error writing video to camera roll: 3310"))
+        << untrimmed.err.toStdString();
+    EXPECT_EQ(hashOf(recording()), original);
+    EXPECT_TRUE(QFileInfo(blocker.fileName()).isFile());
+}
+
+TEST_F(Faults, AHostKilledDuringAnExportLeavesNoPartialClip) {
+    const QString movie = mobile.filePath("long.mp4");
+    testmedia::MovieSpec spec;
+    spec.seconds = 20;
+    spec.width = 640;
+    spec.height = 360;
+    spec.bFrames = 2; // reordered frames: the export goes through the remuxer
+    ASSERT_TRUE(testmedia::writeMovie(movie, spec));
+    const QByteArray original = hashOf(movie);
+
+    QProcess host;
+    startHost(host, movie, "wait ready\ndrag end 19\ntap trimButton\nsleep 60\n");
+    qint64 extension = 0;
+    ASSERT_TRUE(pollUntil([&] { return (extension = childOf(host.processId())) != 0; }, 20000));
+    // The moment the export's first file shows in the store, the host dies.
+    const bool seen = pollUntil([&] { return !storeEntries().isEmpty(); }, 60000);
+    host.kill();
+    host.waitForFinished();
+    ASSERT_TRUE(pollUntil([&] { return processEnded(extension); }, 60000, 20))
+        << "the extension outlived its host";
+    RecordProperty("exportSeenBeforeTheKill", seen ? "yes" : "no");
+    EXPECT_TRUE(storeEntries().isEmpty()) << storeEntries().join(", ").toStdString();
+    expectWholeClipsOnly(19.0);
+    EXPECT_EQ(hashOf(movie), original);
+}
+
+TEST_F(Faults, AnExtensionKilledDuringAnAlbumWriteLeavesNoPartialClip) {
+    const QString movie = mobile.filePath("large.mp4");
+    ASSERT_TRUE(writeLargeRecording(movie, recording(), 160 << 20));
+    QProcess host;
+    startHost(host, movie, "wait ready\ntap saveButton\nsleep 60\n");
+    qint64 extension = 0;
+    ASSERT_TRUE(pollUntil([&] { return (extension = childOf(host.processId())) != 0; }, 20000));
+    // The untrimmed save tells the host first, then writes to the album.
+    QByteArray out;
+    while (!out.contains(kSaved) && host.waitForReadyRead(30000))
+        out += host.readAllStandardOutput();
+    ASSERT_TRUE(out.contains(kSaved)) << out.toStdString();
+    ::kill(pid_t(extension), SIGKILL);
+    ASSERT_TRUE(host.waitForFinished(30000));
+    EXPECT_EQ(host.exitCode(), 1);
+    EXPECT_TRUE(host.readAllStandardError().contains("the editor ended abnormally"));
+    for (const QString& name : albumFiles())
+        EXPECT_EQ(hashOf(album.filePath(name)), hashOf(movie)) << "partial: " << name.toStdString();
+}
+
+TEST_F(Faults, ALargeUntrimmedSaveAcrossFileSystemsArrivesWhole) {
+    // The recording on another file system than the album's (shared memory
+    // and the temporary folder), so the album copies every byte.
+    QString base = "/dev/shm";
+    const qint64 size = 48 << 20;
+    const QStorageInfo shm(base);
+    const QStorageInfo albumVolume(album.path());
+    if (!shm.isValid() || shm.bytesAvailable() < 2 * size || shm.device() == albumVolume.device())
+        base = QDir::tempPath(); // then at least the copy is a large one
+    QTemporaryDir source(base + "/tamsel-large-XXXXXX");
+    ASSERT_TRUE(source.isValid());
+    const QString movie = source.filePath("large.mp4");
+    ASSERT_TRUE(writeLargeRecording(movie, recording(), size));
+    const Run run = edit("wait ready\ntap saveButton\n", movie);
+    ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
+    ASSERT_EQ(albumFiles(), QStringList{"large.mp4"});
+    EXPECT_EQ(hashOf(album.filePath("large.mp4")), hashOf(movie));
+}
+
+TEST_F(Faults, DoneTheInstantATrimmedSaveEndsStillPutsTheWholeClipInTheAlbum) {
+    // The tear-down removes the clip from the store; the album's import of
+    // it, queued a moment before, must not lose it.
+    for (int round = 0; round < 5; ++round) {
+        const Run run = edit(
+            "wait ready\ndrag end 5\ntap trimButton\nwait exporting=false 60\ntap doneButton\n");
+        ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
+        EXPECT_EQ(albumFiles().size(), round + 1) << "round " << round;
+        expectWholeClipsOnly(5.0);
+        EXPECT_TRUE(storeEntries().isEmpty()) << storeEntries().join(", ").toStdString();
+    }
+}
