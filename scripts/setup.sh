@@ -5,6 +5,7 @@ set -euo pipefail
 
 packages=(
   clang-format # the formatting check of .ci/run
+  clang-14 libclang-rt-14-dev # scripts/fuzz.sh: libFuzzer and the sanitizers' runtimes
   build-essential cmake ninja-build pkg-config git ccache
   qt6-base-dev libqt6opengl6-dev qt6-multimedia-dev qt6-base-dev-tools
   libavformat-dev libavcodec-dev libavutil-dev libswscale-dev libswresample-dev

@@ -6,6 +6,7 @@
 #include <QJsonDocument>
 #include <QJsonObject>
 #include <QNetworkReply>
+#include <QRegularExpression>
 
 namespace youtube_publishing {
 
@@ -33,17 +34,46 @@ QString ApiAnswer::reasonOf(const QByteArray& body) {
     return error.value(QLatin1String("status")).toString();
 }
 
+QList<platform::YouTubeVideoCategory> ApiAnswer::categoriesOf(const QByteArray& body) {
+    QList<platform::YouTubeVideoCategory> categories;
+    const QJsonArray items =
+        QJsonDocument::fromJson(body).object().value(QLatin1String("items")).toArray();
+    for (const QJsonValue& item : items) {
+        const QJsonObject snippet = item.toObject().value(QLatin1String("snippet")).toObject();
+        // Only assignable categories can hold a new video.
+        if (snippet.value(QLatin1String("assignable")).toBool())
+            categories.append({item.toObject().value(QLatin1String("id")).toString(),
+                               snippet.value(QLatin1String("title")).toString()});
+    }
+    return categories;
+}
+
+QString ApiAnswer::videoIdOf(const QByteArray& body) {
+    return QJsonDocument::fromJson(body).object().value(QLatin1String("id")).toString();
+}
+
+qint64 ApiAnswer::heldBytesOf(const QByteArray& rangeHeader) {
+    static const QRegularExpression range(QStringLiteral("^bytes=0-(\\d{1,18})$"));
+    const auto match = range.match(QString::fromLatin1(rangeHeader).trimmed());
+    return match.hasMatch() ? match.captured(1).toLongLong() + 1 : 0;
+}
+
 ApiAnswer ApiAnswer::of(QNetworkReply* reply) {
+    return classify(reply->attribute(QNetworkRequest::HttpStatusCodeAttribute).toInt(),
+                    reply->readAll(), reply->errorString());
+}
+
+ApiAnswer ApiAnswer::classify(int status, QByteArray body, const QString& transportError) {
     ApiAnswer answer;
-    answer.status = reply->attribute(QNetworkRequest::HttpStatusCodeAttribute).toInt();
-    answer.body = reply->readAll();
+    answer.status = status;
+    answer.body = std::move(body);
     if (answer.status == 0) {
         // No answer at all: refused, dropped, timed out. The server may have
         // kept part of what was sent; asking it tells.
         answer.kind = Kind::Retry;
         answer.error = PublishingError::make(
             PublishingError::ServerUnavailable,
-            QStringLiteral("YouTube could not be reached: %1").arg(reply->errorString()));
+            QStringLiteral("YouTube could not be reached: %1").arg(transportError));
         return answer;
     }
     const QString reason = reasonOf(answer.body);

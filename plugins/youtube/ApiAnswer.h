@@ -1,8 +1,10 @@
 #pragma once
 
+#include "platform/publishing/YouTubeUploadClient.h"
 #include "platform/runtime/Error.h"
 
 #include <QByteArray>
+#include <QList>
 
 class QNetworkReply;
 
@@ -25,8 +27,21 @@ struct ApiAnswer {
 
     // Reads a finished reply (its body too).
     static ApiAnswer of(QNetworkReply* reply);
+    // What an answer with this status and body means; status 0 is no answer
+    // at all, for the reason `transportError` gives.
+    static ApiAnswer classify(int status, QByteArray body, const QString& transportError);
     // The "reason" of the service's error document ("quotaExceeded"), or "".
     static QString reasonOf(const QByteArray& body);
+
+    // The parts of the service's answers the plug-in reads; whatever a body
+    // or header holds, each gives a plain result, never fails.
+    // The assignable categories of a videoCategories list.
+    static QList<platform::YouTubeVideoCategory> categoriesOf(const QByteArray& body);
+    // The id of the video a finished upload made, or "".
+    static QString videoIdOf(const QByteArray& body);
+    // From a 308's "Range: bytes=0-N": the N + 1 bytes the server holds; 0
+    // without such a header.
+    static qint64 heldBytesOf(const QByteArray& rangeHeader);
 };
 
 } // namespace youtube_publishing

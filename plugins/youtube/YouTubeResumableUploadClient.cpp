@@ -14,7 +14,6 @@
 #include <QNetworkAccessManager>
 #include <QNetworkReply>
 #include <QRandomGenerator>
-#include <QRegularExpression>
 #include <QUrlQuery>
 
 using platform::ErrorPtr;
@@ -25,14 +24,6 @@ namespace PublishingError = platform::PublishingError;
 namespace {
 
 constexpr qint64 kChunkUnit = 256 * 1024;
-
-// "bytes=0-N" of a 308: the server holds N + 1 bytes. Without the header it
-// holds none.
-qint64 heldBytes(QNetworkReply* reply) {
-    static const QRegularExpression range(QStringLiteral("^bytes=0-(\\d+)$"));
-    const auto match = range.match(QString::fromLatin1(reply->rawHeader("Range")).trimmed());
-    return match.hasMatch() ? match.captured(1).toLongLong() + 1 : 0;
-}
 
 } // namespace
 
@@ -117,17 +108,7 @@ void YouTubeResumableUploadClient::requestCategories(const QString& regionCode,
                 handler({}, answer.error);
                 return;
             }
-            QList<platform::YouTubeVideoCategory> categories;
-            const QJsonArray items =
-                QJsonDocument::fromJson(answer.body).object().value("items").toArray();
-            for (const QJsonValue& item : items) {
-                const QJsonObject snippet = item.toObject().value("snippet").toObject();
-                // Only assignable categories can hold a new video.
-                if (snippet.value("assignable").toBool())
-                    categories.append({item.toObject().value("id").toString(),
-                                       snippet.value("title").toString()});
-            }
-            handler(categories, nullptr);
+            handler(ApiAnswer::categoriesOf(answer.body), nullptr);
         });
     });
 }
@@ -293,8 +274,7 @@ void YouTubeResumableUploadClient::received(Step step, QNetworkReply* reply) {
             t.failures = 0;
             run(Step::SendChunk);
         } else {
-            const QJsonObject video = QJsonDocument::fromJson(answer.body).object();
-            const QString id = video.value("id").toString();
+            const QString id = ApiAnswer::videoIdOf(answer.body);
             if (id.isEmpty()) {
                 finish({},
                        PublishingError::make(PublishingError::BadResponse,
@@ -311,7 +291,7 @@ void YouTubeResumableUploadClient::received(Step step, QNetworkReply* reply) {
                                              QStringLiteral("YouTube answered the session oddly")));
             return;
         }
-        const qint64 held = heldBytes(reply);
+        const qint64 held = ApiAnswer::heldBytesOf(reply->rawHeader("Range"));
         // Only bytes the server did not hold before are progress; an answer
         // alone is not, or a server that keeps failing would be tried for ever.
         if (held > t.held)

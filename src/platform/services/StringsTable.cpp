@@ -126,7 +126,10 @@ std::optional<QVariantMap> readStringsFile(const QString& hostPath) {
     QFile file(hostPath);
     if (!file.open(QIODevice::ReadOnly))
         return std::nullopt;
-    const QByteArray bytes = file.readAll();
+    return parseStringsData(file.readAll());
+}
+
+std::optional<QVariantMap> parseStringsData(const QByteArray& bytes) {
     QString text;
     if (bytes.startsWith("\xFF\xFE") || bytes.startsWith("\xFE\xFF")) {
         QStringDecoder decoder(QStringDecoder::Utf16);

@@ -13,7 +13,10 @@ namespace platform {
 // Safe from any thread.
 std::optional<QVariantMap> readStringsFile(const QString& hostPath);
 
-// The same for text already in memory.
+// The same for a file's bytes already in memory.
+std::optional<QVariantMap> parseStringsData(const QByteArray& bytes);
+
+// The same for text already decoded.
 std::optional<QVariantMap> parseStrings(const QString& text);
 
 } // namespace platform
