@@ -38,3 +38,7 @@ add_dependencies(tamsel_media_integration_tests tamsel-test-export)
 target_include_directories(tamsel_media_integration_tests PRIVATE ${PROJECT_SOURCE_DIR}/src/platform/media)
 target_compile_definitions(tamsel_media_integration_tests PRIVATE
   TAMSEL_TEST_EXPORT_TOOL="$<TARGET_FILE:tamsel-test-export>")
+
+tamsel_add_tests(tamsel_media_opening_tests integration
+  SOURCES media/MediaOpeningTest.cpp
+  LIBS tamsel_platform_media)

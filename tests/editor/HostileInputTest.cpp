@@ -10,6 +10,7 @@
 #include <QDirIterator>
 #include <QFile>
 #include <QUrl>
+#include <sys/stat.h>
 
 namespace {
 
@@ -102,4 +103,15 @@ tap doneButton)"),
               QStringList{"recording.mp4"});
     expectOneClipInTheAlbum("through a link");
     EXPECT_TRUE(filesUnder(store()).isEmpty());
+}
+
+TEST_F(HostileInput, APipeAsTheMovieGetsAnEditorThatStillEnds) {
+    // Handed a named pipe, the editor once opened it on the main thread and
+    // waited for good, window and host with it.
+    const QString fifo = mobile.filePath("recording.mp4");
+    ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
+    const Run run = edit("wait log \"not a regular file\" 20\ntap cancelButton\n", fifo);
+    ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
+    EXPECT_EQ(run.hostReport, "[]");
+    EXPECT_TRUE(albumFiles().isEmpty());
 }

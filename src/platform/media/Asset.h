@@ -39,8 +39,10 @@ class Asset {
     // An asset from implementation(): the real one, reading the headers with
     // FFmpeg, unless a test replaced it. Opens the URL (device paths are
     // mapped) and reads its headers synchronously; never null. Something that
-    // is not a movie gives an asset without tracks, with error() set.
-    // Callable from any thread.
+    // is not a movie gives an asset without tracks, with error() set: so does
+    // a path that is not a regular file (refused before anything reads it)
+    // and a file whose headers do not come within a bound of a few seconds.
+    // Callable from any thread, the main thread included.
     static std::shared_ptr<Asset> assetWithURL(const QUrl& url);
     using Maker = std::shared_ptr<Asset>(const QUrl&);
     static Implementation<Maker>& implementation();

@@ -2,6 +2,7 @@
 
 #include "FFmpegHandles.h"
 #include "StreamTime.h"
+#include "platform/runtime/Bounded.h"
 #include "platform/runtime/DevicePaths.h"
 
 #include <QFile>
@@ -52,6 +53,24 @@ std::shared_ptr<Asset> Asset::assetWithURL(const QUrl& url) {
 }
 
 std::shared_ptr<FFmpegAsset> FFmpegAsset::open(const QUrl& url) {
+    // The caller may be the main thread, and a file can stall (a network
+    // share that went away): the headers are read on a thread of their own,
+    // and waited for only so long.
+    if (auto asset = runWithin<std::shared_ptr<FFmpegAsset>>(kHeaderBound,
+                                                             [url] { return readHeaders(url); }))
+        return *asset;
+    std::shared_ptr<FFmpegAsset> asset(new FFmpegAsset);
+    asset->url_ = url;
+    asset->hostPath_ = DevicePaths::hostPathOfUrl(url);
+    asset->error_ =
+        makeError(AVERROR(ETIMEDOUT), mediaErrorDomain(),
+                  QStringLiteral("%1 did not answer within %2 s")
+                      .arg(url.isLocalFile() ? url.toLocalFile() : url.toString())
+                      .arg(std::chrono::duration_cast<std::chrono::seconds>(kHeaderBound).count()));
+    return asset;
+}
+
+std::shared_ptr<FFmpegAsset> FFmpegAsset::readHeaders(const QUrl& url) {
     std::shared_ptr<FFmpegAsset> asset(new FFmpegAsset);
     asset->url_ = url;
     asset->hostPath_ = DevicePaths::hostPathOfUrl(url);

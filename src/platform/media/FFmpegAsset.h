@@ -2,6 +2,8 @@
 
 #include "platform/media/Asset.h"
 
+#include <chrono>
+
 namespace platform {
 
 // The asset on FFmpeg: libavformat reads the headers once, when it is made.
@@ -9,7 +11,13 @@ namespace platform {
 // its readers read through it.
 class FFmpegAsset final : public Asset {
   public:
-    // Never null; see Asset::assetWithURL.
+    // How long open() waits for the headers of a file that does not answer.
+    static constexpr std::chrono::milliseconds kHeaderBound{5000};
+
+    // Never null; see Asset::assetWithURL. A path that is not a regular file
+    // is refused before anything reads it; headers that take longer than
+    // kHeaderBound give an asset without tracks whose error says so (the
+    // reading goes on alone and its result is dropped).
     static std::shared_ptr<FFmpegAsset> open(const QUrl& url);
     ~FFmpegAsset() override;
     FFmpegAsset(const FFmpegAsset&) = delete;
@@ -25,6 +33,7 @@ class FFmpegAsset final : public Asset {
 
   private:
     FFmpegAsset() = default;
+    static std::shared_ptr<FFmpegAsset> readHeaders(const QUrl& url);
 
     QUrl url_;
     QString hostPath_;

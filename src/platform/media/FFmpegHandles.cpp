@@ -4,11 +4,17 @@
 
 #include <QFile>
 
+#include <cerrno>
+#include <fcntl.h>
 #include <mutex>
+#include <sys/stat.h>
+#include <unistd.h>
 
 namespace platform::ffmpeg {
 
 QString errorText(int averror) {
+    if (averror == kNotARegularFile)
+        return QStringLiteral("not a regular file (a pipe, a device, a socket or a folder)");
     char buf[AV_ERROR_MAX_STRING_SIZE] = {};
     av_strerror(averror, buf, sizeof buf);
     return QString::fromUtf8(buf);
@@ -27,9 +33,27 @@ InputPtr openInputAsIs(const QString& hostPath, int* averror) {
     static std::once_flag quiet;
     std::call_once(quiet, [] { av_log_set_level(AV_LOG_ERROR); });
 
+    // A pipe, a device or a folder would have FFmpeg wait on it, maybe for
+    // good: only a regular file is read, and through the descriptor that was
+    // checked, so the name cannot be swapped for something else meanwhile.
+    const int fd = ::open(QFile::encodeName(hostPath).constData(),
+                          O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY);
+    if (fd < 0) {
+        if (averror)
+            *averror = AVERROR(errno);
+        return {};
+    }
+    struct stat info {};
+    if (::fstat(fd, &info) != 0 || !S_ISREG(info.st_mode)) {
+        ::close(fd);
+        if (averror)
+            *averror = kNotARegularFile;
+        return {};
+    }
     AVFormatContext* raw = nullptr;
-    const QByteArray name = QFile::encodeName(hostPath);
+    const QByteArray name = QByteArrayLiteral("/proc/self/fd/") + QByteArray::number(fd);
     int err = avformat_open_input(&raw, name.constData(), nullptr, nullptr);
+    ::close(fd); // FFmpeg has a descriptor of its own on the same file
     if (err < 0) {
         if (averror)
             *averror = err;

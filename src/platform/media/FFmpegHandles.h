@@ -58,14 +58,18 @@ inline PacketPtr makePacket() {
     return PacketPtr(av_packet_alloc());
 }
 
-// FFmpeg's text for an AVERROR code.
+// The AVERROR code of a path that is not a regular file.
+inline constexpr int kNotARegularFile = FFERRTAG('N', 'R', 'E', 'G');
+
+// FFmpeg's text for an AVERROR code (ours too).
 QString errorText(int averror);
 
 // Opens `hostPath` for reading and reads its headers (and, when the container
 // leaves codec parameters out, probes the streams), and settles the streams'
-// lengths where the headers leave them out (see SourceEnds.h). Quiets
-// FFmpeg's own logging to errors the first time it runs. Returns null and
-// sets `averror` on failure.
+// lengths where the headers leave them out (see SourceEnds.h). A path that is
+// not a regular file (a pipe, a device, a socket, a folder) is refused before
+// anything reads it, with kNotARegularFile. Quiets FFmpeg's own logging to
+// errors the first time it runs. Returns null and sets `averror` on failure.
 InputPtr openInput(const QString& hostPath, int* averror);
 // The same without settling the lengths.
 InputPtr openInputAsIs(const QString& hostPath, int* averror);
