@@ -1,7 +1,9 @@
 #include "Mp4Box.h"
 #include "Mp4EditPatch.h"
 
+#include <QFile>
 #include <QTemporaryDir>
+#include <functional>
 #include <gtest/gtest.h>
 
 using namespace platform;
@@ -110,4 +112,67 @@ TEST(Mp4Box, ShortenEditsCutsTheLastEditAndTheHeadersOnly) {
     notes.close();
     EXPECT_FALSE(shortenEdits(text, {MediaTime::make(1, 1)}, &error));
     EXPECT_FALSE(error.isEmpty());
+}
+
+TEST(Mp4Box, SizesThatClaimMoreThanThereIsStopTheReading) {
+    // A 64-bit size past 2^63, which a signed reading turns negative.
+    QByteArray huge = QByteArray::fromHex("00000001") + "free" +
+                      QByteArray::fromHex("8000000000000010") + QByteArray(16, 'x');
+    EXPECT_TRUE(mp4::children(huge, 0, huge.size()).empty());
+    // Bounds past the buffer are clipped to it.
+    const QByteArray small = QByteArray::fromHex("00000008") + "free";
+    EXPECT_EQ(mp4::children(small, -8, 1 << 20).size(), 1u);
+    // Reads and writes outside the buffer touch nothing.
+    EXPECT_EQ(mp4::read32(small, 6), 0u);
+    EXPECT_EQ(mp4::read64(small, -1), 0u);
+    QByteArray copy = small;
+    mp4::write64(copy, 4, 1);
+    EXPECT_EQ(copy, small);
+
+    QTemporaryDir dir;
+    QFile file(dir.filePath("huge.mp4"));
+    ASSERT_TRUE(file.open(QIODevice::ReadWrite));
+    file.write(huge + QByteArray::fromHex("00000008") + "moov");
+    qint64 at = -1;
+    EXPECT_TRUE(mp4::readTopLevelBox(file, "moov", &at).isEmpty());
+}
+
+TEST(Mp4Box, HeadersTooShortForTheirFieldsLeaveTheFileAsItWas) {
+    // The movie box with each header in turn cut to a few bytes.
+    const QByteArray whole = movieWithEdit(600);
+    for (const char* type : {"mvhd", "tkhd", "elst"}) {
+        QByteArray damaged;
+        // Rebuild with the named box shortened to 10 bytes (2 of contents).
+        std::function<void(mp4::Writer&, const QByteArray&, qint64, qint64)> copy =
+            [&](mp4::Writer& w, const QByteArray& d, qint64 from, qint64 to) {
+                for (const mp4::Box& box : mp4::children(d, from, to)) {
+                    if (box.type == type) {
+                        w.begin(type);
+                        w.u16(0);
+                        w.end();
+                    } else if (box.type == "moov" || box.type == "trak" || box.type == "edts") {
+                        w.begin(box.type.constData());
+                        copy(w, d, box.body, box.end);
+                        w.end();
+                    } else {
+                        w.raw(box.bytes(d));
+                    }
+                }
+            };
+        mp4::Writer w;
+        copy(w, whole, 0, whole.size());
+        damaged = w.data();
+
+        QTemporaryDir dir;
+        QFile file(dir.filePath("clip.mp4"));
+        ASSERT_TRUE(file.open(QIODevice::WriteOnly));
+        file.write(damaged);
+        file.close();
+        QString error;
+        EXPECT_FALSE(shortenEdits(file.fileName(), {MediaTime::make(1, 2)}, &error)) << type;
+        EXPECT_FALSE(error.isEmpty()) << type;
+        ASSERT_TRUE(file.open(QIODevice::ReadOnly));
+        EXPECT_EQ(file.readAll(), damaged) << type;
+        file.close();
+    }
 }

@@ -1,10 +1,13 @@
 #include "Mp4Box.h"
 
+#include <algorithm>
+
 namespace platform::mp4 {
 
 std::vector<Box> children(const QByteArray& data, qint64 from, qint64 to) {
     std::vector<Box> boxes;
-    qint64 at = from;
+    to = std::min<qint64>(to, data.size());
+    qint64 at = std::max<qint64>(from, 0);
     while (at + 8 <= to) {
         quint64 size = read32(data, at);
         qint64 header = 8;
@@ -14,7 +17,8 @@ std::vector<Box> children(const QByteArray& data, qint64 from, qint64 to) {
         } else if (size == 0) {
             size = quint64(to - at);
         }
-        if (size < quint64(header) || at + qint64(size) > to)
+        // Compared unsigned: a 64-bit size past 2^63 must not wrap around.
+        if (size < quint64(header) || size > quint64(to - at))
             break;
         boxes.push_back({at, at + header, at + qint64(size), data.mid(at + 4, 4)});
         at += qint64(size);
@@ -43,8 +47,8 @@ QByteArray readTopLevelBox(QFile& file, const char* type, qint64* offset, qint64
             size = read64(header, 8);
         else if (size == 0)
             size = quint64(fileSize - at);
-        if (size < 8)
-            return {};
+        if (size < 8 || size > quint64(fileSize - at))
+            return {}; // a box that claims more than the file holds
         if (header.mid(4, 4) == type) {
             if (qint64(size) > limit || !file.seek(at))
                 return {};

@@ -21,8 +21,8 @@ struct Box {
     QByteArray bytes(const QByteArray& data) const { return data.mid(offset, end - offset); }
 };
 
-// The boxes directly inside [from, to) of `data`; stops at the first that
-// does not fit.
+// The boxes directly inside [from, to) of `data` (clipped to the buffer);
+// stops at the first that does not fit.
 std::vector<Box> children(const QByteArray& data, qint64 from, qint64 to);
 inline std::vector<Box> children(const QByteArray& data, const Box& parent) {
     return children(data, parent.body, parent.end);
@@ -31,17 +31,40 @@ inline std::vector<Box> children(const QByteArray& data, const Box& parent) {
 // The first box of that type, or null.
 const Box* find(const std::vector<Box>& boxes, const char* type);
 
+// Whether `data` holds `size` bytes from `at`.
+inline bool fits(const QByteArray& data, qint64 at, qint64 size) {
+    return at >= 0 && size >= 0 && at <= data.size() - size;
+}
+// Whether the box's contents hold `size` bytes: what a reader of fields at
+// fixed offsets asks before it reads them.
+inline bool holds(const Box& box, qint64 size) {
+    return box.end - box.body >= size;
+}
+// The version byte of a full box; -1 for a box too short to have one.
+inline int version(const QByteArray& data, const Box& box) {
+    return holds(box, 1) && fits(data, box.body, 1) ? quint8(data.at(box.body)) : -1;
+}
+
+// Big-endian fields. Reads outside the buffer give 0 and writes outside it do
+// nothing: callers check the box sizes first, and a damaged file that slips
+// past a check still cannot reach memory outside the buffer.
 inline quint32 read32(const QByteArray& d, qint64 at) {
+    if (!fits(d, at, 4))
+        return 0;
     return qFromBigEndian<quint32>(reinterpret_cast<const uchar*>(d.constData() + at));
 }
 inline quint64 read64(const QByteArray& d, qint64 at) {
+    if (!fits(d, at, 8))
+        return 0;
     return qFromBigEndian<quint64>(reinterpret_cast<const uchar*>(d.constData() + at));
 }
 inline void write32(QByteArray& d, qint64 at, quint32 v) {
-    qToBigEndian<quint32>(v, reinterpret_cast<uchar*>(d.data() + at));
+    if (fits(d, at, 4))
+        qToBigEndian<quint32>(v, reinterpret_cast<uchar*>(d.data() + at));
 }
 inline void write64(QByteArray& d, qint64 at, quint64 v) {
-    qToBigEndian<quint64>(v, reinterpret_cast<uchar*>(d.data() + at));
+    if (fits(d, at, 8))
+        qToBigEndian<quint64>(v, reinterpret_cast<uchar*>(d.data() + at));
 }
 
 // Reads the first top-level box of that type from a file, without reading

@@ -16,16 +16,14 @@ using mp4::children;
 using mp4::find;
 
 quint64 readField(const QByteArray& d, qint64 at, bool wide) {
-    const auto* p = reinterpret_cast<const uchar*>(d.constData() + at);
-    return wide ? qFromBigEndian<quint64>(p) : qFromBigEndian<quint32>(p);
+    return wide ? mp4::read64(d, at) : mp4::read32(d, at);
 }
 
 void writeField(QByteArray& d, qint64 at, bool wide, quint64 value) {
-    auto* p = reinterpret_cast<uchar*>(d.data() + at);
     if (wide)
-        qToBigEndian<quint64>(value, p);
+        mp4::write64(d, at, value);
     else
-        qToBigEndian<quint32>(quint32(std::min<quint64>(value, 0xffffffffu)), p);
+        mp4::write32(d, at, quint32(std::min<quint64>(value, 0xffffffffu)));
 }
 
 } // namespace
@@ -50,13 +48,12 @@ bool shortenEdits(const QString& hostPath, const std::vector<MediaTime>& duratio
         return fail(QStringLiteral("no movie box"));
     const std::vector<Box> inMoov = children(moov, top[0].body, top[0].end);
     const Box* mvhd = find(inMoov, "mvhd");
-    if (!mvhd || mvhd->end - mvhd->body < 32)
+    if (!mvhd || !mp4::holds(*mvhd, 32))
         return fail(QStringLiteral("no movie header"));
-    const bool mvhdWide = moov[mvhd->body] == 1;
+    const bool mvhdWide = mp4::version(moov, *mvhd) == 1;
     const qint64 timescaleAt = mvhd->body + (mvhdWide ? 20 : 12);
-    const quint32 movieTimescale =
-        qFromBigEndian<quint32>(reinterpret_cast<const uchar*>(moov.constData() + timescaleAt));
-    if (movieTimescale == 0)
+    const quint32 movieTimescale = mp4::read32(moov, timescaleAt);
+    if (movieTimescale == 0 || movieTimescale > quint32(INT32_MAX))
         return fail(QStringLiteral("no movie timescale"));
 
     quint64 movieDuration = 0;
@@ -70,16 +67,18 @@ bool shortenEdits(const QString& hostPath, const std::vector<MediaTime>& duratio
         const std::vector<Box> inEdts =
             edts ? children(moov, edts->body, edts->end) : std::vector<Box>();
         const Box* elst = find(inEdts, "elst");
-        if (!tkhd)
+        const bool tkhdWide = tkhd && mp4::version(moov, *tkhd) == 1;
+        if (!tkhd || !mp4::holds(*tkhd, tkhdWide ? 36 : 24))
             return fail(QStringLiteral("no track header"));
-        const bool tkhdWide = moov[tkhd->body] == 1;
         const qint64 tkhdDurationAt = tkhd->body + (tkhdWide ? 28 : 20);
         quint64 total = readField(moov, tkhdDurationAt, tkhdWide);
         if (elst && track < durations.size() && durations[track].isNumeric()) {
-            const bool wide = moov[elst->body] == 1;
+            const bool wide = mp4::version(moov, *elst) == 1;
             const qint64 entrySize = wide ? 20 : 12;
+            if (!mp4::holds(*elst, 8))
+                return fail(QStringLiteral("damaged edit list"));
             const quint32 count = quint32(readField(moov, elst->body + 4, false));
-            if (count == 0 || elst->body + 8 + count * entrySize > elst->end)
+            if (count == 0 || elst->body + 8 + qint64(count) * entrySize > elst->end)
                 return fail(QStringLiteral("damaged edit list"));
             const std::int64_t wanted =
                 StreamTime::fromMediaTime(durations[track], AVRational{1, int(movieTimescale)});
@@ -89,9 +88,10 @@ bool shortenEdits(const QString& hostPath, const std::vector<MediaTime>& duratio
             for (quint32 i = 0; i < count; ++i) {
                 const qint64 entry = elst->body + 8 + i * entrySize;
                 quint64 segment = readField(moov, entry, wide);
-                const std::int64_t left = wanted - std::int64_t(total);
-                if (i + 1 == count && left > 0 && quint64(left) < segment) {
-                    segment = quint64(left);
+                // Unsigned: a damaged list may sum past what a signed count holds.
+                const quint64 goal = wanted > 0 ? quint64(wanted) : 0;
+                if (i + 1 == count && total < goal && goal - total < segment) {
+                    segment = goal - total;
                     writeField(moov, entry, wide, segment);
                 }
                 total += segment;

@@ -48,9 +48,9 @@ QByteArray trackBox(const QByteArray& moov, int trackId) {
             continue;
         const std::vector<Box> inTrak = mp4::children(moov, trak);
         const Box* tkhd = mp4::find(inTrak, "tkhd");
-        if (!tkhd)
+        const bool wide = tkhd && mp4::version(moov, *tkhd) == 1;
+        if (!tkhd || !mp4::holds(*tkhd, wide ? 24 : 16))
             continue;
-        const bool wide = moov[tkhd->body] == 1;
         if (int(mp4::read32(moov, tkhd->body + (wide ? 20 : 12))) == trackId)
             return trak.bytes(moov);
     }
@@ -69,9 +69,11 @@ bool qualifies(const QByteArray& trak, bool* syncTable) {
         const std::vector<Box> inEdts = mp4::children(trak, *edts);
         const Box* elst = mp4::find(inEdts, "elst");
         if (elst) {
+            if (!mp4::holds(*elst, 8))
+                return false;
             // One edit, or a delay (an empty edit) and one edit.
             const quint32 count = mp4::read32(trak, elst->body + 4);
-            const bool wide = trak[elst->body] == 1;
+            const bool wide = mp4::version(trak, *elst) == 1;
             const qint64 firstMediaTime = elst->body + 8 + (wide ? 8 : 4);
             const bool delayFirst = count == 2 && elst->end >= firstMediaTime + 8 &&
                                     (wide ? qint64(mp4::read64(trak, firstMediaTime)) == -1
@@ -167,6 +169,11 @@ bool writeTrack(mp4::Writer& w, const SpanTrack& t, int movieScale, std::int64_t
     const Box* stsd = descend(trak, k5, {"trak", "mdia", "minf", "stbl", "stsd"});
     if (!tkhd || !mdhd || !hdlr || !minf || !stsd)
         return false;
+    // The fields rewritten below lie at fixed offsets: the boxes must reach them.
+    const bool thWide = mp4::version(trak, *tkhd) == 1;
+    const bool mhWide = mp4::version(trak, *mdhd) == 1;
+    if (!mp4::holds(*tkhd, thWide ? 36 : 24) || !mp4::holds(*mdhd, mhWide ? 32 : 20))
+        return false;
     const AVRational tb = t.stream->time_base;
     const std::int64_t editMovie = StreamTime::fromMediaTime(
         StreamTime::toMediaTime(t.cut.editDuration, tb), AVRational{1, movieScale});
@@ -179,7 +186,6 @@ bool writeTrack(mp4::Writer& w, const SpanTrack& t, int movieScale, std::int64_t
 
     w.begin("trak");
     QByteArray th = tkhd->bytes(trak);
-    const bool thWide = trak[tkhd->body] == 1;
     const qint64 thAt = (tkhd->body - tkhd->offset) + (thWide ? 28 : 20);
     if (thWide)
         mp4::write64(th, thAt, quint64(editMovie));
@@ -210,7 +216,6 @@ bool writeTrack(mp4::Writer& w, const SpanTrack& t, int movieScale, std::int64_t
 
     w.begin("mdia");
     QByteArray mh = mdhd->bytes(trak);
-    const bool mhWide = trak[mdhd->body] == 1;
     const qint64 mhAt = (mdhd->body - mdhd->offset) + (mhWide ? 24 : 16);
     if (mhWide)
         mp4::write64(mh, mhAt, quint64(mediaLength));
@@ -296,9 +301,9 @@ bool trySpanCopyExport(const ExportJob& job, ErrorPtr* error) {
         return false;
     std::vector<std::vector<Box>> keep;
     const Box* mvhd = descend(moov, keep, {"moov", "mvhd"});
-    if (!mvhd)
+    const bool mvhdWide = mvhd && mp4::version(moov, *mvhd) == 1;
+    if (!mvhd || !mp4::holds(*mvhd, mvhdWide ? 32 : 20))
         return false;
-    const bool mvhdWide = moov[mvhd->body] == 1;
     const int movieScale = int(mp4::read32(moov, mvhd->body + (mvhdWide ? 20 : 12)));
     if (movieScale <= 0)
         return false;
