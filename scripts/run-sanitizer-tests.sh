@@ -15,10 +15,17 @@ if [ ! -f $build/build.ninja ]; then
     -DTAMSEL_WERROR=$werror -DTAMSEL_SANITIZE=ON -DTAMSEL_BUILD_BENCH=OFF >/dev/null
 fi
 cmake --build $build -j"$(nproc)"
-# The same options the tests carry, for the few that are not gtest's.
 supp=$PWD/tests/sanitizers
 export ASAN_OPTIONS=detect_leaks=1:detect_stack_use_after_return=0:strict_init_order=1:check_initialization_order=1
 export LSAN_OPTIONS=suppressions=$supp/lsan.supp:print_suppressions=0
 export UBSAN_OPTIONS=print_stacktrace=1:halt_on_error=1:suppressions=$supp/ubsan.supp
 cd $build
-ctest --output-on-failure -j"$(nproc)" "$@"
+# Under Xvfb, Qt would load Mesa's GL driver (to learn the graphics quality,
+# and for the video view), which keeps state for the life of the process and
+# is unloaded before LeakSanitizer looks, leaving no name to suppress it by.
+# Without GL the programs draw in software, as on a machine without a GPU.
+export QT_XCB_GL_INTEGRATION=none
+ctest --output-on-failure -j"$(nproc)" -E 'OpenGLUnderXvfb' "$@"
+# The one test that is about GL, with everything checked but leaks.
+ASAN_OPTIONS=${ASAN_OPTIONS/detect_leaks=1/detect_leaks=0} env -u QT_XCB_GL_INTEGRATION \
+  ctest --output-on-failure -R 'OpenGLUnderXvfb' "$@"

@@ -50,11 +50,12 @@ int main(int argc, char** argv) {
         std::fprintf(stderr, "--present takes alert or popover\n");
 
     int status = 0;
+    // Outlives the loop: the poll below reads it on every turn.
+    QElapsedTimer waited;
     if (!screenshot.isEmpty()) {
         auto* poll = new QTimer(&app);
-        QElapsedTimer waited;
         waited.start();
-        QObject::connect(poll, &QTimer::timeout, &app, [&] {
+        QObject::connect(poll, &QTimer::timeout, &app, [&, poll] {
             // A moment more after settling lets the last fade finish.
             if (!(gallery->isSettled() && waited.elapsed() > 800) && waited.elapsed() < 10000)
                 return;

@@ -145,12 +145,12 @@ TEST_F(Faults, AnAlbumThatCannotBeWrittenLosesNothing) {
 
 TEST_F(Faults, AHostKilledDuringAnExportLeavesNoPartialClip) {
     const QString movie = mobile.filePath("long.mp4");
-    testmedia::MovieSpec spec;
-    spec.seconds = 20;
-    spec.width = 640;
-    spec.height = 360;
-    spec.bFrames = 2; // reordered frames: the export goes through the remuxer
-    ASSERT_TRUE(testmedia::writeMovie(movie, spec));
+    testmedia::MovieSpec movieSpec;
+    movieSpec.seconds = 20;
+    movieSpec.width = 640;
+    movieSpec.height = 360;
+    movieSpec.bFrames = 2; // reordered frames: the export goes through the remuxer
+    ASSERT_TRUE(testmedia::writeMovie(movie, movieSpec));
     const QByteArray original = hashOf(movie);
 
     QProcess host;

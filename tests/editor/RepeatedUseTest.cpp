@@ -19,11 +19,11 @@ class RepeatedUse : public EndToEnd, public ::testing::WithParamInterface<int> {
   protected:
     static void SetUpTestSuite() {
         dir = new QTemporaryDir;
-        testmedia::MovieSpec spec;
-        spec.seconds = 2; // the shortest that takes a trim (one second at least)
-        spec.keyframeInterval = 10;
+        testmedia::MovieSpec movieSpec;
+        movieSpec.seconds = 2; // the shortest that takes a trim (one second at least)
+        movieSpec.keyframeInterval = 10;
         QString error;
-        ASSERT_TRUE(testmedia::writeMovie(recording(), spec, &error)) << error.toStdString();
+        ASSERT_TRUE(testmedia::writeMovie(recording(), movieSpec, &error)) << error.toStdString();
     }
 
     static void expectNormalEnd(const Run& run, int round) {

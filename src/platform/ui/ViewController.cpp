@@ -110,7 +110,7 @@ void ViewController::viewWillTransitionToSize_withTransitionCoordinator(
 }
 
 bool ViewController::eventFilter(QObject* watched, QEvent* event) {
-    if (view_ && watched == view_.get() && !event->spontaneous()) {
+    if (view_.holds(watched) && !event->spontaneous()) {
         if (event->type() == QEvent::Show)
             beginAppearance(true);
         else if (event->type() == QEvent::Hide)

@@ -32,18 +32,24 @@ template <class T> class ViewHandle {
     }
 
     void reset() {
-        if (T* view = view_.data())
-            ViewHandles::release(view);
+        // As a QWidget: a view in the middle of its destruction is one no more.
+        if (QObject* view = view_.data())
+            ViewHandles::release(static_cast<QWidget*>(view));
         view_ = nullptr;
     }
 
-    T* get() const { return view_.data(); }
-    T* operator->() const { return view_.data(); }
-    T& operator*() const { return *view_; }
+    T* get() const { return static_cast<T*>(view_.data()); }
+    T* operator->() const { return get(); }
+    T& operator*() const { return *get(); }
     explicit operator bool() const { return !view_.isNull(); }
 
+    // Whether `object` is the view held. Safe in the view's own destruction
+    // (event filters see it then), when it can no longer be taken as a T.
+    bool holds(const QObject* object) const { return object && object == view_.data(); }
+
   private:
-    QPointer<T> view_;
+    // Held as a QObject, so that nothing casts a view that is half destroyed.
+    QPointer<QObject> view_;
 };
 
 } // namespace platform

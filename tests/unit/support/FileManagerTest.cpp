@@ -6,7 +6,12 @@
 #include <QDir>
 #include <QFileInfo>
 #include <cmath>
+#include <fcntl.h>
+#include <functional>
 #include <limits>
+#include <linux/fs.h>
+#include <sys/ioctl.h>
+#include <unistd.h>
 
 using platform::LogLevel;
 
@@ -205,4 +210,63 @@ TEST_F(FileManagerFixture, FreeSpaceIsRead32BitsWideAndMustExceedTheRequirement)
         EXPECT_EQ(manager->_srDeviceFreeDiskSpace(), c.read);
         EXPECT_EQ(manager->_srDeviceHasSufficientFreeSpaceForRecording(), c.sufficient);
     }
+}
+
+namespace {
+
+// Makes `path` a file nothing may delete: immutable where the file system
+// and our privileges allow it (as root), else in a folder we cannot write.
+// Returns the undo, or null when neither works here.
+std::function<void()> makeUndeletable(const QString& folder, const QString& name) {
+    const QString path = folder + "/" + name;
+    testing_support::writeFile(path, 100);
+    const int fd = ::open(QFile::encodeName(path).constData(), O_RDONLY | O_CLOEXEC);
+    int flags = 0;
+    if (fd >= 0 && ::ioctl(fd, FS_IOC_GETFLAGS, &flags) == 0) {
+        flags |= FS_IMMUTABLE_FL;
+        if (::ioctl(fd, FS_IOC_SETFLAGS, &flags) == 0)
+            return [fd, flags] {
+                int cleared = flags & ~FS_IMMUTABLE_FL;
+                ::ioctl(fd, FS_IOC_SETFLAGS, &cleared);
+                ::close(fd);
+            };
+    }
+    if (fd >= 0)
+        ::close(fd);
+    if (::geteuid() != 0) {
+        // Not root: a folder entry whose contents we may not remove.
+        const QString locked = folder + "/" + name + ".d";
+        testing_support::writeFile(locked + "/inside", 100);
+        QFile::setPermissions(locked, QFileDevice::ReadOwner | QFileDevice::ExeOwner);
+        return [locked] {
+            QFile::setPermissions(locked, QFileDevice::ReadOwner | QFileDevice::WriteOwner |
+                                              QFileDevice::ExeOwner);
+        };
+    }
+    return nullptr;
+}
+
+} // namespace
+
+TEST(FileManagerOnDisk, APurgeThatMeetsAnEntryItCannotDeleteRemovesTheRestAndGoesOn) {
+    testing_support::MobileRoot root;
+    root.makeLibrary();
+    const QString folder = root.hostPath("Library/Tamsel");
+    testing_support::writeFile(folder + "/a.mp4", 10);
+    testing_support::writeFile(folder + "/z.mp4", 20);
+    const auto undo = makeUndeletable(folder, "locked.mp4");
+    if (!undo)
+        GTEST_SKIP() << "no way to make an undeletable file here";
+    testing_support::LogCapture logs;
+    const auto manager = FileManager::create(platform::FileSystem::local());
+
+    const qint64 removed = manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(0);
+    undo();
+    EXPECT_FALSE(QFile::exists(folder + "/a.mp4"));
+    EXPECT_FALSE(QFile::exists(folder + "/z.mp4")) << "the purge goes on past the failure";
+    EXPECT_LE(removed, 30);
+    EXPECT_FALSE(
+        logs.startingWith("error in _tqRemoveFile_srDeleteFilesOlderThanTimeToLiveInSeconds")
+            .isEmpty());
+    EXPECT_FALSE(QDir(folder).isEmpty()) << "what could not go is still there, whole";
 }
