@@ -9,6 +9,9 @@
 #include <QTemporaryDir>
 #include <gtest/gtest.h>
 
+// What the host prints when the user saved to the album and left.
+inline const QByteArray kSavedToAlbumReport = "[\"org.tamsel.activity.SaveToAlbum\"]";
+
 // Runs tamsel-edit with an automation script on a generated recording, in a
 // device, an album and a temporary directory of its own.
 class EndToEnd : public ::testing::Test {

@@ -30,8 +30,6 @@ QProcessEnvironment environmentWith(const QString& name, const QString& value) {
     return environment;
 }
 
-const QByteArray kSaved = "[\"org.tamsel.activity.SaveToAlbum\"]";
-
 // A recording made longer by a free box of `padding` bytes at its end, which
 // players skip: a large file that is quick to make.
 bool writeLargeRecording(const QString& path, const QString& from, qint64 padding) {
@@ -136,7 +134,7 @@ TEST_F(Faults, AnAlbumThatCannotBeWrittenLosesNothing) {
 
     const Run untrimmed = edit("wait ready\ntap saveButton\n", {}, {}, env);
     ASSERT_EQ(untrimmed.exitCode, 0) << untrimmed.err.toStdString();
-    EXPECT_EQ(untrimmed.hostReport, kSaved);
+    EXPECT_EQ(untrimmed.hostReport, kSavedToAlbumReport);
     EXPECT_TRUE(untrimmed.err.contains("Error writing video to camera roll: 3310"))
         << untrimmed.err.toStdString();
     EXPECT_EQ(hashOf(recording()), original);
@@ -178,9 +176,9 @@ TEST_F(Faults, AnExtensionKilledDuringAnAlbumWriteLeavesNoPartialClip) {
     ASSERT_TRUE(pollUntil([&] { return (extension = childOf(host.processId())) != 0; }, 20000));
     // The untrimmed save tells the host first, then writes to the album.
     QByteArray out;
-    while (!out.contains(kSaved) && host.waitForReadyRead(30000))
+    while (!out.contains(kSavedToAlbumReport) && host.waitForReadyRead(30000))
         out += host.readAllStandardOutput();
-    ASSERT_TRUE(out.contains(kSaved)) << out.toStdString();
+    ASSERT_TRUE(out.contains(kSavedToAlbumReport)) << out.toStdString();
     ::kill(pid_t(extension), SIGKILL);
     ASSERT_TRUE(host.waitForFinished(30000));
     EXPECT_EQ(host.exitCode(), 1);

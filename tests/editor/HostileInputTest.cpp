@@ -14,8 +14,6 @@
 
 namespace {
 
-const QByteArray kSaved = "[\"org.tamsel.activity.SaveToAlbum\"]";
-
 const char* kTrimmedSave = R"(
 wait ready
 drag end 3
@@ -62,7 +60,7 @@ TEST_F(HostileInput, ApplicationNamesThatArePathsStayInTheStoreAndStillSave) {
         const std::string context = name.left(40).toStdString();
         const Run run = edit(kTrimmedSave, {}, {"--app-name", name});
         ASSERT_EQ(run.exitCode, 0) << context << "\n" << run.err.toStdString();
-        EXPECT_EQ(run.hostReport, kSaved) << context;
+        EXPECT_EQ(run.hostReport, kSavedToAlbumReport) << context;
         EXPECT_TRUE(filesUnder(outside.path()).isEmpty()) << context;
         expectOneClipInTheAlbum(context);
         EXPECT_TRUE(filesUnder(store()).isEmpty())
@@ -96,7 +94,7 @@ tap doneButton)"),
     QFile::setPermissions(readOnly,
                           QFileDevice::ReadOwner | QFileDevice::WriteOwner | QFileDevice::ExeOwner);
     ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
-    EXPECT_EQ(run.hostReport, kSaved);
+    EXPECT_EQ(run.hostReport, kSavedToAlbumReport);
     EXPECT_EQ(hashOf(readOnly + "/recording.mp4"), original)
         << "the host's movie is never modified";
     EXPECT_EQ(QDir(readOnly).entryList(QDir::AllEntries | QDir::NoDotAndDotDot | QDir::Hidden),

@@ -60,7 +60,7 @@ wait exporting=false 30
 tap doneButton
 )");
         expectNormalEnd(run, round);
-        EXPECT_EQ(run.hostReport, "[\"org.tamsel.activity.SaveToAlbum\"]") << "round " << round;
+        EXPECT_EQ(run.hostReport, kSavedToAlbumReport) << "round " << round;
         EXPECT_EQ(albumFiles().size(), round + 1) << "round " << round;
         EXPECT_TRUE(tempFiles().isEmpty()) << "round " << round;
     }
