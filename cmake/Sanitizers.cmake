@@ -29,9 +29,11 @@ if(TAMSEL_SANITIZE OR TAMSEL_FUZZ)
     link_libraries(Qt6::DBus)
   endif()
   if(TAMSEL_SANITIZE AND NOT DEFINED CMAKE_UNITY_BUILD)
-    # Built once per CI run from nothing: sources compiled in batches parse
-    # Qt's headers once per batch, which halves the build. (GCC then sees a
-    # source's own anonymous types as a header's, hence the warning off.)
+    # Built once per CI run from nothing: the product's sources compiled in
+    # batches parse Qt's headers once per batch, which saves a good part of
+    # the build. (GCC then sees a source's own anonymous types as a header's,
+    # hence the warning off.) The tests, whose files often share helper
+    # names, are compiled one by one (tests/CMakeLists.txt).
     set(CMAKE_UNITY_BUILD ON)
     set(CMAKE_UNITY_BUILD_BATCH_SIZE 16)
     add_compile_options(-Wno-subobject-linkage)

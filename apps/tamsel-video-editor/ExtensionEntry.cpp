@@ -31,6 +31,11 @@ bool ExtensionEntry::eventFilter(QObject* watched, QEvent* event) {
 
 ExtensionEntry::~ExtensionEntry() {
     endRequest();
+    // The members go before the QObject part that would take the filters
+    // down with it, and the window sends its views events as it goes.
+    window_.removeEventFilter(this);
+    if (principal_ && principal_->isViewLoaded())
+        principal_->view()->removeEventFilter(this);
     endpoint_.onRequest = nullptr;
     endpoint_.onDismiss = nullptr;
     endpoint_.onHostGone = nullptr;
