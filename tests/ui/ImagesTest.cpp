@@ -7,30 +7,25 @@
 using namespace platform;
 
 TEST(UiImages, NamedImagesComeInTheVariantOfTheScale) {
-    const auto bundle =
-        Bundle::bundleWithPath(QStringLiteral("/System/Library/Frameworks/Tamsel.framework"));
+    const auto bundle = Bundle::bundleWithPath("/System/Library/Frameworks/Tamsel.framework");
     ASSERT_TRUE(bundle);
+    const auto glyph = [&](qreal scale, const QString& name = "TXVideoOverlayGlyphMask") {
+        return NamedImage::imageNamed(name, bundle.get(), scale);
+    };
     for (int scale : {1, 2, 3}) {
-        const QImage image =
-            NamedImage::imageNamed(QStringLiteral("TXVideoOverlayGlyphMask"), bundle.get(), scale);
-        ASSERT_FALSE(image.isNull());
-        EXPECT_EQ(image.devicePixelRatio(), scale);
-        EXPECT_EQ(image.width(), 80 * scale);
-        EXPECT_EQ(image.deviceIndependentSize(), QSizeF(80, 80));
+        ASSERT_FALSE(glyph(scale).isNull());
+        EXPECT_EQ(glyph(scale).devicePixelRatio(), scale);
+        EXPECT_EQ(glyph(scale).width(), 80 * scale);
+        EXPECT_EQ(glyph(scale).deviceIndependentSize(), QSizeF(80, 80));
     }
-    // Between variants the larger one serves.
-    EXPECT_EQ(NamedImage::imageNamed(QStringLiteral("TXVideoOverlayGlyphMask"), bundle.get(), 1.5)
-                  .devicePixelRatio(),
-              2);
-    EXPECT_TRUE(NamedImage::imageNamed(QStringLiteral("NoSuchImage"), bundle.get(), 2).isNull());
-    EXPECT_TRUE(
-        NamedImage::imageNamed(QStringLiteral("TXVideoOverlayGlyphMask"), nullptr, 2).isNull());
+    EXPECT_EQ(glyph(1.5).devicePixelRatio(), 2) << "between variants the larger one serves";
+    EXPECT_TRUE(glyph(2, "NoSuchImage").isNull());
+    EXPECT_TRUE(NamedImage::imageNamed("TXVideoOverlayGlyphMask", nullptr, 2).isNull());
 }
 
 TEST(UiImages, OffscreenDrawingBlendsAtTheContextsScale) {
     ImageContext context(QSizeF(10, 10), false, 2.0);
     context.fillRect(QRectF(0, 0, 10, 10), 0.5, 1.0);
-
     QImage punch(4, 4, QImage::Format_ARGB32_Premultiplied); // 2 x 2 points at scale 2
     punch.fill(Qt::black);
     punch.setDevicePixelRatio(2.0);
@@ -46,7 +41,5 @@ TEST(UiImages, OffscreenDrawingBlendsAtTheContextsScale) {
     EXPECT_NEAR(image.pixelColor(6, 6).red(), 128, 2);
     EXPECT_NEAR(image.pixelColor(11, 11).red(), 64, 2) << "black at half over grey";
     EXPECT_EQ(image.pixelColor(11, 11).alpha(), 255);
-
-    ImageContext empty(QSizeF(0, 0), false, 2.0);
-    EXPECT_TRUE(empty.image().isNull());
+    EXPECT_TRUE(ImageContext(QSizeF(0, 0), false, 2.0).image().isNull());
 }
