@@ -124,43 +124,6 @@ TEST(PlaybackPlayer, BoundaryObserverFiresWhenPlaybackReachesItsTime) {
     EXPECT_EQ(firedAt.size(), 2);
 }
 
-TEST(PlaybackPlayer, ASeekTakingAnotherSeeksPlaceReportsItUnfinished) {
-    auto player = Player::playerWithPlayerItem(PlayerItem::playerItemWithURL(clip(2)));
-    QList<bool> results;
-    const MediaTime zero = MediaTime::zero();
-    // Both made before the item has loaded: the later one wins and is applied
-    // once it has.
-    for (double seconds : {0.5, 1.0})
-        player->seekToTime_toleranceBefore_toleranceAfter_completionHandler(
-            MediaTime::fromSeconds(seconds, 600), zero, zero,
-            [&](bool done) { results.append(done); });
-    ASSERT_TRUE(waitUntil([&] { return results.size() == 2; }));
-    EXPECT_EQ(results, (QList<bool>{false, true}));
-    EXPECT_EQ(player->currentTime().seconds(), 1.0);
-
-    // An invalid time refuses at once.
-    player->seekToTime_toleranceBefore_toleranceAfter_completionHandler(
-        MediaTime::invalid(), zero, zero, [&](bool done) { results.append(done); });
-    ASSERT_TRUE(waitUntil([&] { return results.size() == 3; }));
-    EXPECT_FALSE(results.last());
-    EXPECT_EQ(player->currentTime().seconds(), 1.0);
-}
-
-TEST(PlaybackPlayer, AtTheEndNoneKeepsPlayingAndAdvanceLetsTheItemGo) {
-    for (auto action : {Player::ActionAtItemEnd::None, Player::ActionAtItemEnd::Advance}) {
-        auto item = PlayerItem::playerItemWithURL(clip(1));
-        EndWatcher end(item);
-        auto player = readyPlayer(item);
-        player->setActionAtItemEnd(action);
-        player->play();
-        ASSERT_TRUE(end.waitFor(1));
-        const bool none = action == Player::ActionAtItemEnd::None;
-        EXPECT_EQ(player->rate(), none ? 1.0f : 0.0f);
-        EXPECT_EQ(player->currentItem(), none ? item : nullptr);
-        EXPECT_EQ(player->currentTime().isValid(), none);
-    }
-}
-
 TEST(PlaybackPlayer, ReplacingTheItemLoadingOrPlayingPlaysOnlyTheNewOne) {
     // Replaced at different points of its loading, or while it plays: the
     // events of the first file must never be taken for the second's.

@@ -36,17 +36,3 @@ TEST(UiFlatOverlayImage, GreyDiscWithTheGlyphKnockedOutAndDrawnBackAtItsAlpha) {
     EXPECT_NEAR(at(other, {14, 40}).red(), 0.5 * 255, 2);
     EXPECT_NEAR(at(other, {40, 40}).alpha(), 255, 2);
 }
-
-TEST(UiFlatOverlayImage, ImagesAreMadeOnceAndSharedByEveryFlatButton) {
-    TXFlatVideoOverlayButton first(2);
-    TXFlatVideoOverlayButton second(0);
-    using State = platform::Button::State;
-    const auto key = [](TXFlatVideoOverlayButton& b, State s) {
-        return b.imageForState(s).cacheKey();
-    };
-    EXPECT_EQ(key(first, State::Normal), key(second, State::Normal));
-    EXPECT_EQ(key(first, State::Highlighted), key(second, State::Highlighted));
-    EXPECT_NE(key(first, State::Normal), key(first, State::Highlighted));
-    EXPECT_EQ(TXFlatVideoOverlayButton::_normalButtonImage().cacheKey(), key(first, State::Normal));
-    EXPECT_EQ(first.size(), QSize(80, 80)) << "the button takes the image's size";
-}

@@ -117,6 +117,7 @@ TEST(UiOverlayButton, FlatTapSendsTheButtonAndHighlightsWhilePressed) {
     EXPECT_EQ(stage.flat->currentImage().cacheKey(),
               TXFlatVideoOverlayButton::_normalButtonImage().cacheKey());
     EXPECT_EQ(target.senders, QList<QObject*>{stage.flat});
+    EXPECT_EQ(TXFlatVideoOverlayButton(0).size(), QSize(80, 80)) << "the image's size";
 }
 
 TEST(UiOverlayButton, ATargetGoneOrNotRespondingIsLeftAloneAndTheSuperviewHearsNoTap) {
