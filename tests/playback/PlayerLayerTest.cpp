@@ -49,7 +49,7 @@ TEST(PlaybackPlayerLayer, ExactSeeksLandOnTheRequestedTimeAndShowItsFrame) {
     variable.keyframeInterval = 25;
     const struct {
         QUrl url;
-        testmedia::MovieSpec spec;
+        testmedia::MovieSpec movie;
         QList<int> frames; // between keyframes, on one, and backwards
     } clips[] = {{clip(2), plain(2), {17, 45, 30, 3, 59}},
                  {clipUrl("vfr", variable), variable, {13, 37, 24, 51}}};
@@ -70,11 +70,11 @@ TEST(PlaybackPlayerLayer, ExactSeeksLandOnTheRequestedTimeAndShowItsFrame) {
         shows(*layer, 0);
 
         const std::int32_t scale = player->currentTime().timescale;
-        const bool constant = !c.spec.variableFrameRate;
+        const bool constant = !c.movie.variableFrameRate;
         for (int frame : c.frames) {
             SCOPED_TRACE(frame);
             const MediaTime target = MediaTime::fromSeconds(
-                constant ? frame / 30.0 : testmedia::frameTime(c.spec, frame), scale);
+                constant ? frame / 30.0 : testmedia::frameTime(c.movie, frame), scale);
             bool finished = false;
             player->seekToTime_toleranceBefore_toleranceAfter_completionHandler(
                 target, MediaTime::zero(), MediaTime::zero(), [&](bool done) { finished = done; });
