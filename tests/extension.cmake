@@ -2,7 +2,8 @@ tamsel_add_tests(tamsel_extension_tests unit
   SOURCES extension/ExtensionContextTest.cpp
   LIBS tamsel_extension)
 
-tamsel_add_tests(tamsel_principal_tests integration
+# The principal controller over fake media: no files, no libmpv at run time.
+tamsel_add_tests(tamsel_principal_tests unit
   SOURCES extension/PrincipalControllerTest.cpp
-  LIBS tamsel_extension_principal tamsel_media_generator
+  LIBS tamsel_extension_principal tamsel_test_fakes
   MAIN tamsel_ui_test_main)

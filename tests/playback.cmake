@@ -7,10 +7,6 @@ tamsel_add_tests(tamsel_playback_unit_tests unit
     playback/AudioOutputTest.cpp
   LIBS tamsel_platform_playback)
 
-# Widget tests need a QApplication.
-add_library(tamsel_playback_test_main STATIC playback/PlaybackTestMain.cpp)
-target_link_libraries(tamsel_playback_test_main PUBLIC tamsel_test_support Qt6::Widgets GTest::gtest)
-
 tamsel_add_tests(tamsel_playback_integration_tests integration
   SOURCES
     playback/PlaybackFixture.cpp
@@ -19,7 +15,7 @@ tamsel_add_tests(tamsel_playback_integration_tests integration
     playback/PlayerLayerTest.cpp
     playback/RecordingKindsPlaybackTest.cpp
   LIBS tamsel_platform_playback tamsel_media_generator
-  MAIN tamsel_playback_test_main)
+  MAIN tamsel_ui_test_main)
 
 # The OpenGL path of the video widget, on a virtual X server with Mesa's
 # software GL, when the machine has one.

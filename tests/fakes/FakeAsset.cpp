@@ -15,27 +15,25 @@ FakeAsset::FakeAsset(const QUrl& url, const std::optional<FakeMovie>& movie)
                            QStringLiteral("%1: No such file or directory").arg(url.toString()));
         return;
     }
-    duration_ = MediaTime::fromSeconds(movie->seconds, movie->timescale);
+    duration_ = MediaTime::fromSeconds(movie->seconds, 600);
     if (movie->video) {
-        AssetTrack video;
-        video.trackID = 1;
-        video.mediaType = MediaType::Video;
-        video.naturalSize = QSizeF(movie->size);
-        video.preferredTransform = QTransform().rotate(movie->rotationDegrees);
-        video.naturalTimeScale = movie->timescale;
-        video.timeRange = MediaTimeRange::make(MediaTime::make(0, movie->timescale), duration_);
-        video.nominalFrameRate = 30;
-        tracks_.append(video);
+        AssetTrack track;
+        track.trackID = 1;
+        track.mediaType = MediaType::Video;
+        track.naturalSize = QSizeF(movie->size);
+        track.preferredTransform = QTransform().rotate(movie->rotationDegrees);
+        track.naturalTimeScale = 600;
+        track.timeRange = MediaTimeRange::make(MediaTime::make(0, 600), duration_);
+        track.nominalFrameRate = 30;
+        tracks_.append(track);
     }
-    if (movie->audio) {
-        AssetTrack audio;
-        audio.trackID = int(tracks_.size()) + 1;
-        audio.mediaType = MediaType::Audio;
-        audio.naturalTimeScale = 48000;
-        audio.timeRange = MediaTimeRange::make(MediaTime::make(0, 48000),
-                                               MediaTime::fromSeconds(movie->seconds, 48000));
-        tracks_.append(audio);
-    }
+    AssetTrack audio;
+    audio.trackID = int(tracks_.size()) + 1;
+    audio.mediaType = MediaType::Audio;
+    audio.naturalTimeScale = 48000;
+    audio.timeRange = MediaTimeRange::make(MediaTime::make(0, 48000),
+                                           MediaTime::fromSeconds(movie->seconds, 48000));
+    tracks_.append(audio);
 }
 
 } // namespace fakes

@@ -7,9 +7,9 @@
 
 namespace fakes {
 
-// An asset whose headers come from the fake world instead of a file: a video
-// track (and an audio track) as the movie describes, or, where the world has
-// no movie, no tracks and the error a missing file gives.
+// An asset whose headers come from the fake world instead of a file: the
+// movie's video track (unless it has none) and an audio track, or, where the
+// world has no movie, no tracks and the error a missing file gives.
 class FakeAsset final : public platform::Asset {
   public:
     FakeAsset(const QUrl& url, const std::optional<FakeMovie>& movie);

@@ -13,7 +13,7 @@ ErrorPtr import(FakeWorld& world, const QString& devicePath) {
     if (!world.movieAt(QUrl::fromLocalFile(devicePath)))
         return makeError(PhotoAlbum::NotVideo, QStringLiteral("PhotoAlbum"),
                          QStringLiteral("%1 is not a playable video").arg(devicePath));
-    world.recordAlbumImport(devicePath);
+    world.change([&](FakeWorld::State& s) { s.albumImports.append(devicePath); });
     return nullptr;
 }
 } // namespace

@@ -28,7 +28,7 @@ class FakePlatform {
     FakePlatform(const FakePlatform&) = delete;
     FakePlatform& operator=(const FakePlatform&) = delete;
 
-    FakeWorld& world() { return *world_; }
+    FakeWorld& world() const { return *world_; }
 
   private:
     template <typename Signature>

@@ -5,6 +5,7 @@
 
 #include <QList>
 
+#include <algorithm>
 #include <atomic>
 #include <optional>
 #include <vector>
@@ -22,8 +23,6 @@ class FakePlayer final : public platform::Player, public std::enable_shared_from
   public:
     static std::shared_ptr<FakePlayer> make(std::shared_ptr<platform::PlayerItem> item);
     ~FakePlayer() override;
-    FakePlayer(const FakePlayer&) = delete;
-    FakePlayer& operator=(const FakePlayer&) = delete;
 
     std::shared_ptr<platform::PlayerItem> currentItem() const override { return item_; }
     void replaceCurrentItemWithPlayerItem(std::shared_ptr<platform::PlayerItem> item) override;
@@ -32,7 +31,9 @@ class FakePlayer final : public platform::Player, public std::enable_shared_from
     ActionAtItemEnd actionAtItemEnd() const override { return actionAtItemEnd_; }
     void setActionAtItemEnd(ActionAtItemEnd action) override { actionAtItemEnd_ = action; }
     platform::MediaTime currentTime() const override;
-    void seekToTime(const platform::MediaTime& time) override;
+    void seekToTime(const platform::MediaTime& time) override {
+        seekToTime_toleranceBefore_toleranceAfter_completionHandler(time, {}, {}, {});
+    }
     void seekToTime_toleranceBefore_toleranceAfter_completionHandler(
         const platform::MediaTime& time, const platform::MediaTime& toleranceBefore,
         const platform::MediaTime& toleranceAfter, SeekCompletion completion) override;
@@ -54,33 +55,32 @@ class FakePlayer final : public platform::Player, public std::enable_shared_from
 
     // Every seek asked for, in order, as asked.
     const QList<platform::MediaTime>& seeks() const { return seeks_; }
-    int periodicObserverCount() const { return int(periodic_.size()); }
-    int boundaryObserverCount() const { return int(boundaries_.size()); }
+    int periodicObserverCount() const { return observerCount(false); }
+    int boundaryObserverCount() const { return observerCount(true); }
 
   private:
     FakePlayer() = default;
-    using Liveness = std::shared_ptr<std::atomic_bool>;
-    struct Periodic {
+    struct Observer {
         std::uint64_t id;
-        Liveness alive;
+        std::shared_ptr<std::atomic_bool> alive; // read where the block runs
         ObserverQueue queue;
         std::function<void(platform::MediaTime)> block;
-    };
-    struct Boundary {
-        std::uint64_t id;
-        Liveness alive;
-        QList<double> seconds;
-        ObserverQueue queue;
-        std::function<void()> block;
+        QList<double> boundaries; // in seconds; empty for a periodic observer
     };
 
+    int observerCount(bool boundary) const {
+        return int(std::count_if(observers_.begin(), observers_.end(), [&](const Observer& o) {
+            return o.boundaries.isEmpty() != boundary;
+        }));
+    }
     void load(std::uint64_t generation);
-    void issueSeek();
-    void finishSeeks(bool finished);
+    void land(std::uint64_t seek);
+    void endSeek(bool finished);
+    platform::TimeObserverToken addObserver(QList<double> boundaries, ObserverQueue queue,
+                                            std::function<void(platform::MediaTime)> block);
+    void notify(const Observer& observer);
     void firePeriodicObservers();
-    void fireBoundaries(double from, double to, bool inclusiveEnd);
-    void endOfItem(double from);
-    void run(const ObserverQueue& queue, const Liveness& alive, std::function<void()> job);
+    void fireBoundaries(double from, double to, bool atEnd);
 
     std::shared_ptr<FakePlayerItem> item_;
     std::uint64_t generation_ = 0; // bumped by every item change
@@ -90,10 +90,9 @@ class FakePlayer final : public platform::Player, public std::enable_shared_from
     double position_ = 0; // seconds
     std::optional<platform::MediaTime> seekTarget_;
     std::uint64_t seekId_ = 0; // bumped by every seek
-    std::vector<SeekCompletion> seekCompletions_;
+    SeekCompletion seekCompletion_;
     QList<platform::MediaTime> seeks_;
-    std::vector<Periodic> periodic_;
-    std::vector<Boundary> boundaries_;
+    std::vector<Observer> observers_;
     std::uint64_t nextObserverId_ = 1;
 };
 

@@ -5,39 +5,30 @@
 
 #include <QHash>
 #include <QList>
-#include <QSize>
 #include <QSizeF>
-#include <QString>
+#include <QStringList>
 #include <QUrl>
 
-#include <cstdint>
 #include <mutex>
 #include <optional>
 
 namespace fakes {
 
-// A movie of the fake world: it exists only here, never on disk.
+// A movie of the fake world: it exists only here, never on disk. Its times
+// are at a timescale of 600, its audio at 48 kHz.
 struct FakeMovie {
     double seconds = 10;
     QSize size{320, 240};
     int rotationDegrees = 0; // the display matrix's turn, clockwise
     bool video = true;
-    bool audio = true;
-    std::int32_t timescale = 600;
 };
 
-// What the fakes share: the movies at their URLs, how exports end, and a
-// record of what was asked of the services. Any thread; each call is atomic.
+// What the fakes share: the movies at their URLs (found by path, so a device
+// path and its file URL name the same movie), how exports end, and a record
+// of what was asked of the services. Any thread: state() is a copy taken
+// under the lock, change() runs under it.
 class FakeWorld {
   public:
-    void addMovie(const QUrl& url, const FakeMovie& movie);
-    std::optional<FakeMovie> movieAt(const QUrl& url) const;
-
-    // How the next exports end: Completed (the clip then exists at the output
-    // URL), or Failed with `errorCode`, or Cancelled.
-    void setExportOutcome(platform::ExportSessionStatus status, int errorCode = 0);
-    std::pair<platform::ExportSessionStatus, int> exportOutcome() const;
-
     struct Export {
         QUrl source;
         QString presetName;
@@ -45,32 +36,43 @@ class FakeWorld {
         QString fileType;
         platform::MediaTimeRange range;
     };
-    void recordExport(const Export& exported);
-    QList<Export> exports() const;
+    struct State {
+        QHash<QString, FakeMovie> movies;
+        // How exports end: Completed (the clip then exists at the output
+        // URL), Failed with `exportError`, or Cancelled.
+        platform::ExportSessionStatus exportStatus = platform::ExportSessionStatus::Completed;
+        int exportError = 0;
+        QList<Export> exports;
+        QList<double> generatedTimes; // every image asked for, in seconds
+        QSizeF lastMaximumSize;       // the box the last one was to fit in
+        QList<double> failingTimes;   // times whose frame cannot be decoded
+        QStringList albumImports;     // device paths of the videos the album took in
+    };
 
-    // Every time an image generator was asked for, in seconds, and the box
-    // it was to fit in.
-    void recordGeneration(double seconds, const QSizeF& maximumSize);
-    QList<double> generatedTimes() const;
-    QSizeF lastMaximumSize() const;
-    // Times whose generation fails (the frame cannot be decoded).
-    void failGenerationAt(double seconds);
-    bool generationFailsAt(double seconds) const;
-
-    // What reached the album: the device paths of the videos it took in.
-    void recordAlbumImport(const QString& devicePath);
-    QStringList albumImports() const;
+    State state() const {
+        std::lock_guard lock(mutex_);
+        return state_;
+    }
+    template <typename Change> void change(Change&& change) {
+        std::lock_guard lock(mutex_);
+        change(state_);
+    }
+    void addMovie(const QUrl& url, const FakeMovie& movie) {
+        change([&](State& s) { s.movies.insert(keyOf(url), movie); });
+    }
+    std::optional<FakeMovie> movieAt(const QUrl& url) const {
+        std::lock_guard lock(mutex_);
+        const auto found = state_.movies.constFind(keyOf(url));
+        return found == state_.movies.cend() ? std::nullopt : std::optional(*found);
+    }
 
   private:
+    static QString keyOf(const QUrl& url) {
+        return url.isLocalFile() ? url.toLocalFile() : url.toString();
+    }
+
     mutable std::mutex mutex_;
-    QHash<QString, FakeMovie> movies_;
-    platform::ExportSessionStatus exportStatus_ = platform::ExportSessionStatus::Completed;
-    int exportError_ = 0;
-    QList<Export> exports_;
-    QList<double> generated_;
-    QSizeF maximumSize_;
-    QList<double> failingTimes_;
-    QStringList albumImports_;
+    State state_;
 };
 
 } // namespace fakes

@@ -3,44 +3,40 @@
 
 #include <QDir>
 #include <QFile>
+#include <QFileInfo>
 #include <QTemporaryDir>
 
 #include <gtest/gtest.h>
 
-using testing_support::ScopedEnv;
+namespace AudioOutput = platform::AudioOutput;
 
 TEST(PlaybackAudioOutput, UsesTheSoundServerWhenThereIsOneAndSilenceOtherwise) {
     QTemporaryDir runtime;
-    ScopedEnv env;
-    env.set("XDG_RUNTIME_DIR", runtime.path().toUtf8());
-    env.unset("PULSE_SERVER");
-    env.unset("PIPEWIRE_REMOTE");
-    env.unset("TAMSEL_AUDIO");
-
+    testing_support::ScopedEnv env("XDG_RUNTIME_DIR", runtime.path().toUtf8());
+    for (const char* name : {"PULSE_SERVER", "PIPEWIRE_REMOTE", "TAMSEL_AUDIO"})
+        env.unset(name);
+    const auto touch = [&](const QString& name) {
+        QDir(runtime.path()).mkpath(QFileInfo(name).path());
+        QFile(runtime.filePath(name)).open(QIODevice::WriteOnly);
+    };
     // No server socket: silence, without probing sound devices.
-    EXPECT_EQ(platform::AudioOutput::mpvOption(), "null");
+    EXPECT_EQ(AudioOutput::mpvOption(), "null");
 
-    // A PulseAudio socket (PipeWire's compatibility one included).
-    QDir(runtime.path()).mkpath("pulse");
-    QFile socket(runtime.filePath("pulse/native"));
-    ASSERT_TRUE(socket.open(QIODevice::WriteOnly));
-    socket.close();
-    EXPECT_EQ(platform::AudioOutput::mpvOption(), "pipewire,pulse,null");
-
-    // Asked for silence, the server is left alone.
+    // A PulseAudio socket (PipeWire's compatibility one included), unless
+    // silence is asked for.
+    touch("pulse/native");
+    EXPECT_EQ(AudioOutput::mpvOption(), "pipewire,pulse,null");
     env.set("TAMSEL_AUDIO", "null");
-    EXPECT_EQ(platform::AudioOutput::mpvOption(), "null");
+    EXPECT_EQ(AudioOutput::mpvOption(), "null");
     env.unset("TAMSEL_AUDIO");
+    QFile::remove(runtime.filePath("pulse/native"));
 
     // A PipeWire socket by its configured name, or an explicit server.
-    QFile::remove(runtime.filePath("pulse/native"));
-    EXPECT_EQ(platform::AudioOutput::mpvOption(), "null");
     env.set("PIPEWIRE_REMOTE", "custom-0");
-    QFile pipewire(runtime.filePath("custom-0"));
-    ASSERT_TRUE(pipewire.open(QIODevice::WriteOnly));
-    pipewire.close();
-    EXPECT_EQ(platform::AudioOutput::mpvOption(), "pipewire,pulse,null");
+    EXPECT_EQ(AudioOutput::mpvOption(), "null");
+    touch("custom-0");
+    EXPECT_EQ(AudioOutput::mpvOption(), "pipewire,pulse,null");
     env.unset("PIPEWIRE_REMOTE");
     env.set("PULSE_SERVER", "tcp:localhost:4713");
-    EXPECT_EQ(platform::AudioOutput::mpvOption(), "pipewire,pulse,null");
+    EXPECT_EQ(AudioOutput::mpvOption(), "pipewire,pulse,null");
 }

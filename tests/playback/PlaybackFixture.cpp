@@ -4,7 +4,6 @@
 #include "platform/runtime/MainQueue.h"
 #include "support/Wait.h"
 
-#include <QDir>
 #include <QFile>
 #include <QHash>
 #include <QTemporaryDir>
@@ -14,56 +13,52 @@
 namespace playback_test {
 
 namespace {
-
-QTemporaryDir& directory() {
+QString pathOf(const QString& name) {
     static QTemporaryDir dir;
-    return dir;
+    return dir.filePath(name);
 }
-
 } // namespace
 
-QString clipPath(const QString& name, const testmedia::MovieSpec& movieSpec) {
+QUrl clipUrl(const QString& name, const testmedia::MovieSpec& movieSpec) {
     static QHash<QString, QString> made;
-    if (made.contains(name))
-        return made.value(name);
-    const QString path = directory().filePath(name + QStringLiteral(".mp4"));
-    QString error;
-    if (!testmedia::writeMovie(path, movieSpec, &error))
-        ADD_FAILURE() << "cannot make clip " << name.toStdString() << ": " << error.toStdString();
-    made.insert(name, path);
-    return path;
+    if (!made.contains(name)) {
+        const QString path = pathOf(name + testmedia::suffixFor(movieSpec));
+        QString error;
+        if (!testmedia::writeMovie(path, movieSpec, &error))
+            ADD_FAILURE() << "cannot make clip " << name.toStdString() << ": "
+                          << error.toStdString();
+        made.insert(name, path);
+    }
+    return QUrl::fromLocalFile(made.value(name));
 }
 
-QUrl clipUrl(const QString& name, const testmedia::MovieSpec& movieSpec) {
-    return QUrl::fromLocalFile(clipPath(name, movieSpec));
+testmedia::MovieSpec plain(double seconds) {
+    testmedia::MovieSpec movieSpec;
+    movieSpec.seconds = seconds;
+    return movieSpec;
+}
+
+QUrl clip(double seconds) {
+    return clipUrl(QStringLiteral("plain-%1s").arg(seconds), plain(seconds));
 }
 
 QUrl fileWithBytes(const QString& name, const QByteArray& bytes) {
-    const QString path = directory().filePath(name);
-    QFile file(path);
+    QFile file(pathOf(name));
     if (!file.open(QIODevice::WriteOnly) || file.write(bytes) != bytes.size())
-        ADD_FAILURE() << "cannot write " << path.toStdString();
-    return QUrl::fromLocalFile(path);
+        ADD_FAILURE() << "cannot write " << name.toStdString();
+    return QUrl::fromLocalFile(file.fileName());
 }
 
-testmedia::MovieSpec oneSecond() {
-    testmedia::MovieSpec movieSpec;
-    movieSpec.seconds = 1;
-    return movieSpec;
-}
-
-testmedia::MovieSpec twoSeconds() {
-    testmedia::MovieSpec movieSpec;
-    movieSpec.seconds = 2;
-    movieSpec.keyframeInterval = 30;
-    return movieSpec;
-}
-
-platform::PlayerItem::Status waitForStatus(const std::shared_ptr<platform::PlayerItem>& item,
-                                           int timeoutMs) {
+platform::PlayerItem::Status waitForStatus(const std::shared_ptr<platform::PlayerItem>& item) {
     testing_support::waitUntil(
-        [&] { return item->status() != platform::PlayerItem::Status::Unknown; }, timeoutMs);
+        [&] { return item->status() != platform::PlayerItem::Status::Unknown; });
     return item->status();
+}
+
+std::shared_ptr<platform::Player> readyPlayer(const std::shared_ptr<platform::PlayerItem>& item) {
+    auto player = platform::Player::playerWithPlayerItem(item);
+    EXPECT_EQ(waitForStatus(item), platform::PlayerItem::Status::ReadyToPlay);
+    return player;
 }
 
 EndWatcher::EndWatcher(const std::shared_ptr<platform::PlayerItem>& item) {
@@ -71,12 +66,16 @@ EndWatcher::EndWatcher(const std::shared_ptr<platform::PlayerItem>& item) {
         this, platform::itemDidPlayToEndNotification(), item.get(),
         [this](const platform::Notification&) {
             ++count_;
-            onMainThread_ = onMainThread_ && platform::MainQueue::isCurrent();
+            EXPECT_TRUE(platform::MainQueue::isCurrent());
         });
 }
 
 EndWatcher::~EndWatcher() {
     platform::NotificationCenter::defaultCenter().removeObserver(this);
+}
+
+bool EndWatcher::waitFor(int n) const {
+    return testing_support::waitUntil([&] { return count_ >= n; }, 15000);
 }
 
 } // namespace playback_test

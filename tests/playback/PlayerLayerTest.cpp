@@ -13,21 +13,29 @@
 #include <memory>
 
 using namespace platform;
-using playback_test::clipUrl;
-using playback_test::EndWatcher;
-using playback_test::waitForStatus;
+using namespace playback_test;
 using testing_support::waitUntil;
 
 namespace {
 
-// The frame index the layer shows, or -1.
-int shownFrame(MpvPlayerLayer& layer) {
-    return testmedia::readFrameIndex(layer.grab().toImage());
+// The layer shows `frame` (of the coded picture, turned back by `degrees`).
+bool shows(MpvPlayerLayer& layer, int frame, int degrees = 0) {
+    int shown = -1;
+    const bool found = waitUntil(
+        [&] {
+            const QImage image = layer.grab().toImage();
+            shown = testmedia::readFrameIndex(image.transformed(QTransform().rotate(-degrees)));
+            return shown == frame;
+        },
+        5000);
+    EXPECT_TRUE(found) << "shows frame " << shown << ", not " << frame;
+    return found;
 }
 
-std::unique_ptr<MpvPlayerLayer> shownLayer(const std::shared_ptr<Player>& player) {
+std::unique_ptr<MpvPlayerLayer> shownLayer(const std::shared_ptr<Player>& player,
+                                           QSize size = QSize(320, 240)) {
     auto layer = std::make_unique<MpvPlayerLayer>();
-    layer->setFrame(QRect(0, 0, 320, 240)); // the clips' own size: no bars
+    layer->setFrame(QRect(QPoint(), size)); // the clips' own size: no bars
     layer->setPlayer(player);
     layer->show();
     return layer;
@@ -35,48 +43,62 @@ std::unique_ptr<MpvPlayerLayer> shownLayer(const std::shared_ptr<Player>& player
 
 } // namespace
 
-TEST(PlaybackPlayerLayer, ShowsTheFrameAtEachSeek) {
-    auto item = PlayerItem::playerItemWithURL(clipUrl("two", playback_test::twoSeconds()));
-    auto player = Player::playerWithPlayerItem(item);
-    auto layer = shownLayer(player);
-    // The same test runs on both paths: offscreen in software, and under a
-    // GL-capable X server with OpenGL forced.
-    const QString forced = qEnvironmentVariable("TAMSEL_VIDEO_RENDERER");
-    if (forced == "opengl") {
-        EXPECT_TRUE(layer->usesOpenGL()) << "GL was forced and is there";
-    } else if (forced == "software" || QGuiApplication::platformName() == "offscreen") {
-        EXPECT_FALSE(layer->usesOpenGL());
-    }
-    ASSERT_EQ(waitForStatus(item), PlayerItem::Status::ReadyToPlay);
-    ASSERT_TRUE(waitUntil([&] { return layer->isReadyForDisplay(); }));
-    EXPECT_TRUE(waitUntil([&] { return shownFrame(*layer) == 0; }, 5000)) << shownFrame(*layer);
+TEST(PlaybackPlayerLayer, ExactSeeksLandOnTheRequestedTimeAndShowItsFrame) {
+    testmedia::MovieSpec variable = plain(2);
+    variable.variableFrameRate = true;
+    variable.keyframeInterval = 25;
+    const struct {
+        QUrl url;
+        testmedia::MovieSpec movie;
+        QList<int> frames; // between keyframes, on one, and backwards
+    } clips[] = {{clip(2), plain(2), {17, 45, 30, 3, 59}},
+                 {clipUrl("vfr", variable), variable, {13, 37, 24, 51}}};
+    for (const auto& c : clips) {
+        SCOPED_TRACE(c.url.fileName().toStdString());
+        auto item = PlayerItem::playerItemWithURL(c.url);
+        auto player = Player::playerWithPlayerItem(item);
+        auto layer = shownLayer(player);
+        // Offscreen in software, or under a GL-capable X server with OpenGL
+        // forced: the same test runs on both paths.
+        const QString forced = qEnvironmentVariable("TAMSEL_VIDEO_RENDERER");
+        if (forced == "opengl" || forced == "software" ||
+            QGuiApplication::platformName() == "offscreen") {
+            EXPECT_EQ(layer->usesOpenGL(), forced == "opengl");
+        }
+        ASSERT_EQ(waitForStatus(item), PlayerItem::Status::ReadyToPlay);
+        ASSERT_TRUE(waitUntil([&] { return layer->isReadyForDisplay(); }));
+        shows(*layer, 0);
 
-    const std::int32_t scale = player->currentTime().timescale;
-    for (int frame : {17, 44, 31, 2}) {
-        SCOPED_TRACE(frame);
-        bool finished = false;
-        player->seekToTime_toleranceBefore_toleranceAfter_completionHandler(
-            MediaTime::fromSeconds(frame / 30.0, scale), MediaTime::zero(), MediaTime::zero(),
-            [&](bool done) { finished = done; });
-        ASSERT_TRUE(waitUntil([&] { return finished; }));
-        EXPECT_TRUE(waitUntil([&] { return shownFrame(*layer) == frame; }, 5000))
-            << shownFrame(*layer);
+        const std::int32_t scale = player->currentTime().timescale;
+        const bool constant = !c.movie.variableFrameRate;
+        for (int frame : c.frames) {
+            SCOPED_TRACE(frame);
+            const MediaTime target = MediaTime::fromSeconds(
+                constant ? frame / 30.0 : testmedia::frameTime(c.movie, frame), scale);
+            bool finished = false;
+            player->seekToTime_toleranceBefore_toleranceAfter_completionHandler(
+                target, MediaTime::zero(), MediaTime::zero(), [&](bool done) { finished = done; });
+            EXPECT_EQ(player->currentTime(), target) << "the target is reported while seeking";
+            ASSERT_TRUE(waitUntil([&] { return finished; }));
+            EXPECT_EQ(player->currentTime(), target);
+            EXPECT_EQ(item->currentTime(), target);
+            shows(*layer, frame);
+        }
+        if (!constant)
+            continue;
+        // The default tolerance shows the frame at the time too; resized while
+        // paused, the same frame is drawn at the new size.
+        player->seekToTime(MediaTime::fromSeconds(52 / 30.0, scale));
+        ASSERT_TRUE(waitUntil([&] { return !player->isSeeking(); }));
+        shows(*layer, 52);
+        layer->setFrame(QRect(0, 0, 160, 120));
+        shows(*layer, 52);
     }
-    // The default tolerance shows the frame at the time too.
-    player->seekToTime(MediaTime::fromSeconds(52 / 30.0, scale));
-    EXPECT_TRUE(waitUntil([&] { return !player->isSeeking() && shownFrame(*layer) == 52; }, 5000))
-        << shownFrame(*layer);
-
-    // Resized while paused, the same frame is drawn at the new size.
-    layer->setFrame(QRect(0, 0, 160, 120));
-    EXPECT_TRUE(waitUntil([&] { return shownFrame(*layer) == 52; }, 5000)) << shownFrame(*layer);
 }
 
 TEST(PlaybackPlayerLayer, ScrubbingEndsOnTheLastRequestedFrame) {
-    auto item = PlayerItem::playerItemWithURL(clipUrl("two", playback_test::twoSeconds()));
-    auto player = Player::playerWithPlayerItem(item);
+    auto player = readyPlayer(PlayerItem::playerItemWithURL(clip(2)));
     auto layer = shownLayer(player);
-    ASSERT_EQ(waitForStatus(item), PlayerItem::Status::ReadyToPlay);
     const std::int32_t scale = player->currentTime().timescale;
     // A drag: a seek for every move, each taking the last one's place, with
     // the loop turning only now and then.
@@ -91,93 +113,55 @@ TEST(PlaybackPlayerLayer, ScrubbingEndsOnTheLastRequestedFrame) {
     EXPECT_EQ(player->currentTime(), last);
     ASSERT_TRUE(waitUntil([&] { return !player->isSeeking(); }));
     EXPECT_EQ(player->currentTime(), last);
-    EXPECT_TRUE(waitUntil([&] { return shownFrame(*layer) == frame; }, 5000)) << shownFrame(*layer);
-}
-
-TEST(PlaybackPlayerLayer, ExactSeeksOnAVariableFrameRateRecordingShowTheirFrame) {
-    testmedia::MovieSpec movieSpec = playback_test::twoSeconds();
-    movieSpec.variableFrameRate = true;
-    movieSpec.keyframeInterval = 25;
-    auto item = PlayerItem::playerItemWithURL(clipUrl("vfr", movieSpec));
-    auto player = Player::playerWithPlayerItem(item);
-    auto layer = shownLayer(player);
-    ASSERT_EQ(waitForStatus(item), PlayerItem::Status::ReadyToPlay);
-    const std::int32_t scale = player->currentTime().timescale;
-    for (int frame : {13, 37, 24, 51}) {
-        SCOPED_TRACE(frame);
-        const MediaTime at = MediaTime::fromSeconds(testmedia::frameTime(movieSpec, frame), scale);
-        bool finished = false;
-        player->seekToTime_toleranceBefore_toleranceAfter_completionHandler(
-            at, MediaTime::zero(), MediaTime::zero(), [&](bool done) { finished = done; });
-        ASSERT_TRUE(waitUntil([&] { return finished; }));
-        EXPECT_EQ(player->currentTime(), at) << player->currentTime().description().toStdString();
-        EXPECT_TRUE(waitUntil([&] { return shownFrame(*layer) == frame; }, 5000))
-            << shownFrame(*layer);
-    }
+    shows(*layer, frame);
 }
 
 TEST(PlaybackPlayerLayer, ShowsTurnedRecordingsUpright) {
     for (int degrees : {90, 180, 270}) {
         SCOPED_TRACE(degrees);
-        testmedia::MovieSpec movieSpec = playback_test::oneSecond();
+        testmedia::MovieSpec movieSpec = plain(1);
         movieSpec.rotationDegrees = degrees;
-        auto item = PlayerItem::playerItemWithURL(
-            clipUrl(QStringLiteral("turned%1").arg(degrees), movieSpec));
-        auto player = Player::playerWithPlayerItem(item);
-        auto layer = std::make_unique<MpvPlayerLayer>();
+        auto item =
+            PlayerItem::playerItemWithURL(clipUrl(QString("turned%1").arg(degrees), movieSpec));
         // The coded size turned, so the picture fills the layer.
-        layer->setFrame(degrees == 180 ? QRect(0, 0, 320, 240) : QRect(0, 0, 240, 320));
-        layer->setPlayer(player);
-        layer->show();
+        auto layer = shownLayer(Player::playerWithPlayerItem(item),
+                                degrees == 180 ? QSize(320, 240) : QSize(240, 320));
         ASSERT_EQ(waitForStatus(item), PlayerItem::Status::ReadyToPlay);
         ASSERT_TRUE(waitUntil([&] { return layer->isReadyForDisplay(); }));
-        // Turned back, the picture is the coded frame.
-        const auto codedFrame = [&] {
-            const QImage shown = layer->grab().toImage();
-            return testmedia::readFrameIndex(shown.transformed(QTransform().rotate(-degrees)));
-        };
-        EXPECT_TRUE(waitUntil([&] { return codedFrame() == 0; }, 5000)) << codedFrame();
+        shows(*layer, 0, degrees);
     }
 }
 
-TEST(PlaybackPlayerLayer, TakingTheVideoOverMidwayKeepsPlaybackGoing) {
-    auto item = PlayerItem::playerItemWithURL(clipUrl("two", playback_test::twoSeconds()));
+TEST(PlaybackPlayerLayer, LayersComeAndGoWhilePlaybackGoesOnAndHoldTheirPlayer) {
+    auto item = PlayerItem::playerItemWithURL(clip(2));
     EndWatcher end(item);
-    auto player = Player::playerWithPlayerItem(item);
-    ASSERT_EQ(waitForStatus(item), PlayerItem::Status::ReadyToPlay);
+    auto player = readyPlayer(item);
     player->play();
     ASSERT_TRUE(waitUntil([&] { return player->currentTime().seconds() > 0.3; }));
 
     // A layer arrives while the video plays headless, then a second layer
     // takes it over, then the second goes away: the clock keeps running and
-    // the item still ends.
+    // the item still ends, though only the layer refers to the player now.
     auto first = shownLayer(player);
     ASSERT_TRUE(waitUntil([&] { return first->isReadyForDisplay(); }));
     auto second = shownLayer(player);
     ASSERT_TRUE(waitUntil([&] { return second->isReadyForDisplay(); }));
     second.reset();
-    ASSERT_TRUE(waitUntil([&] { return end.count() == 1; }, 15000));
+    const std::weak_ptr<Player> held = player;
+    player.reset();
+    ASSERT_TRUE(end.waitFor(1));
 
-    // At the end the last frame stays up.
+    // At the end the last frame stays up, also when the layer takes the
+    // player anew.
+    player = first->player();
     first->setPlayer(nullptr);
     first->setPlayer(player);
-    const int last = testmedia::frameCount(playback_test::twoSeconds()) - 1;
-    EXPECT_TRUE(waitUntil([&] { return shownFrame(*first) == last; }, 5000)) << shownFrame(*first);
-}
+    player.reset();
+    shows(*first, testmedia::frameCount(plain(2)) - 1);
 
-TEST(PlaybackPlayerLayer, ALayerOutlivingItsPlayerReferenceIsSafe) {
-    auto item = PlayerItem::playerItemWithURL(clipUrl("one", playback_test::oneSecond()));
-    auto layer = shownLayer(Player::playerWithPlayerItem(item));
-    ASSERT_EQ(waitForStatus(item), PlayerItem::Status::ReadyToPlay);
-    // The layer holds the player: it plays on though nobody else refers to it.
-    EndWatcher end(item);
-    layer->player()->play();
-    ASSERT_TRUE(waitUntil([&] { return end.count() == 1; }, 15000));
     // Pointed at a new player, the layer lets the old one go.
-    std::weak_ptr<Player> old = layer->player();
-    auto next = Player::playerWithURL(clipUrl("two", playback_test::twoSeconds()));
-    layer->setPlayer(next);
-    EXPECT_TRUE(old.expired());
-    ASSERT_EQ(waitForStatus(next->currentItem()), PlayerItem::Status::ReadyToPlay);
-    EXPECT_TRUE(waitUntil([&] { return shownFrame(*layer) == 0; }, 5000)) << shownFrame(*layer);
+    first->setPlayer(Player::playerWithURL(clip(1)));
+    EXPECT_TRUE(held.expired());
+    ASSERT_EQ(waitForStatus(first->player()->currentItem()), PlayerItem::Status::ReadyToPlay);
+    shows(*first, 0);
 }

@@ -10,53 +10,37 @@
 #include <gtest/gtest.h>
 
 using namespace platform;
-using playback_test::EndWatcher;
-using playback_test::waitForStatus;
-using testing_support::waitUntil;
-using testmedia::AudioCodec;
-using testmedia::Container;
-using testmedia::MovieSpec;
-using testmedia::VideoCodec;
+using namespace playback_test;
+using namespace testmedia;
 
 TEST(PlaybackRecordingKinds, PreviewToTheEnd) {
-    struct Case {
-        const char* name;
-        MovieSpec movie;
-    };
-    auto make = [](Container c, VideoCodec v, AudioCodec a, auto&& tweak) {
-        MovieSpec s;
-        s.seconds = 2;
+    const auto make = [](Container c, VideoCodec v, AudioCodec a, bool cutShort, int start = 0) {
+        MovieSpec s = plain(cutShort ? 4 : 2);
         s.container = c;
         s.videoCodec = v;
         s.audioCodec = a;
-        tweak(s);
+        s.truncated = cutShort;
+        s.startSeconds = start;
         return s;
     };
-    const Case cases[] = {
-        {"webm-vp8-vorbis",
-         make(Container::WebM, VideoCodec::VP8, AudioCodec::Vorbis, [](auto&) {})},
-        {"fragmented-cut-short", make(Container::FragmentedMp4, VideoCodec::H264, AudioCodec::AAC,
-                                      [](MovieSpec& s) {
-                                          s.seconds = 4;
-                                          s.truncated = true;
-                                      })},
-        {"webm-cut-short", make(Container::WebM, VideoCodec::VP9, AudioCodec::Opus,
-                                [](MovieSpec& s) {
-                                    s.seconds = 4;
-                                    s.truncated = true;
-                                })},
-        {"matroska-late", make(Container::Matroska, VideoCodec::HEVC, AudioCodec::AAC,
-                               [](MovieSpec& s) { s.startSeconds = 30; })},
+    const struct {
+        const char* name;
+        MovieSpec movie;
+    } cases[] = {
+        {"webm-vp8-vorbis", make(Container::WebM, VideoCodec::VP8, AudioCodec::Vorbis, false)},
+        {"fragmented-cut-short",
+         make(Container::FragmentedMp4, VideoCodec::H264, AudioCodec::AAC, true)},
+        {"webm-cut-short", make(Container::WebM, VideoCodec::VP9, AudioCodec::Opus, true)},
+        {"matroska-late", make(Container::Matroska, VideoCodec::HEVC, AudioCodec::AAC, false, 30)},
     };
-    for (const Case& c : cases) {
+    for (const auto& c : cases) {
         SCOPED_TRACE(c.name);
-        const QUrl url = playback_test::clipUrl(QString::fromLatin1(c.name), c.movie);
+        const QUrl url = clipUrl(QString::fromLatin1(c.name), c.movie);
         const auto asset = Asset::assetWithURL(url);
         ASSERT_FALSE(asset->error());
         auto item = PlayerItem::playerItemWithURL(url);
         EndWatcher end(item);
-        auto player = Player::playerWithPlayerItem(item);
-        ASSERT_EQ(waitForStatus(item), PlayerItem::Status::ReadyToPlay);
+        auto player = readyPlayer(item);
         const double duration = item->duration().seconds();
         EXPECT_NEAR(duration, asset->duration().seconds(), 1e-3);
         EXPECT_GT(duration, 1.0);
@@ -64,7 +48,7 @@ TEST(PlaybackRecordingKinds, PreviewToTheEnd) {
         EXPECT_NEAR(player->currentTime().seconds(), 0.0, 1e-3);
         player->seekToTime(MediaTime::fromSeconds(duration - 0.5, 600));
         player->play();
-        ASSERT_TRUE(waitUntil([&] { return end.count() == 1; }, 15000));
+        ASSERT_TRUE(end.waitFor(1));
         EXPECT_NEAR(player->currentTime().seconds(), duration, 0.1);
     }
 }

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "scrubber/RecordingScrubberClient.h"
+#include "ui/UiInput.h"
 
 #include <gtest/gtest.h>
 #include <memory>
@@ -12,22 +13,31 @@ namespace testing_support {
 // x = 10 to x = 410: 40 px per second, time t at x = 10 + 40 t.
 class ScrubberFixture : public ::testing::Test {
   protected:
-    void SetUp() override;
-    void TearDown() override;
+    void SetUp() override {
+        scrubber->setDelegate(client);
+        scrubber->setDataSource(client);
+        scrubber->resize(420, 38);
+        scrubber->show();
+        scrubber->reloadData();
+        client->calls.clear();
+    }
 
     static double xAt(double seconds) { return 10.0 + 40.0 * seconds; }
-
-    // Left-button mouse gestures at widget x (y in the middle).
-    void press(double x);
-    void move(double x);
-    void release(double x);
-    void drag(double from, double to); // press, one move, release
-    void key(int key, Qt::KeyboardModifiers modifiers = Qt::NoModifier);
-    // Gives the scrubber keyboard focus in an active window.
-    void focus();
+    // Left-button mouse gestures at widget x (y in the middle), and keys.
+    void press(double x) { ui_input::press(scrubber.get(), {x, 19}); }
+    void move(double x) { ui_input::move(scrubber.get(), {x, 19}); }
+    void release(double x) { ui_input::release(scrubber.get(), {x, 19}); }
+    void drag(double from, double to) {
+        press(from);
+        move(to);
+        release(to);
+    }
+    void key(int key, Qt::KeyboardModifiers modifiers = Qt::NoModifier) {
+        ui_input::key(scrubber.get(), key, modifiers);
+    }
 
     std::shared_ptr<RecordingScrubberClient> client = std::make_shared<RecordingScrubberClient>();
-    std::unique_ptr<platform::MovieScrubber> scrubber;
+    std::unique_ptr<platform::MovieScrubber> scrubber = std::make_unique<platform::MovieScrubber>();
 };
 
 } // namespace testing_support

@@ -12,7 +12,7 @@
 using namespace platform;
 using Idiom = Device::InterfaceIdiom;
 
-TEST(UiDevice, TheIdiomCanBeForcedByArgumentEnvironmentOrSetter) {
+TEST(UiDevice, IdiomAndGraphicsQualityComeFromTheDesktopUnlessForced) {
     testing_support::ScopedEnv env;
     env.unset("TAMSEL_DEVICE");
     EXPECT_EQ(Device::userInterfaceIdiom(), Idiom::Unspecified)
@@ -26,18 +26,15 @@ TEST(UiDevice, TheIdiomCanBeForcedByArgumentEnvironmentOrSetter) {
     EXPECT_EQ(Device::userInterfaceIdiom(), Idiom::Phone) << "the switch beats the environment";
 
     testing_support::LogCapture log;
-    QStringList bad{"app", "--device=watch"};
-    EXPECT_FALSE(Device::applyDeviceArgument(bad));
-    EXPECT_EQ(bad, QStringList{"app"});
+    arguments = {"app", "--device=watch"};
+    EXPECT_FALSE(Device::applyDeviceArgument(arguments));
+    EXPECT_EQ(arguments, QStringList{"app"});
     EXPECT_EQ(log.lines().size(), 1);
     EXPECT_EQ(Device::userInterfaceIdiom(), Idiom::Phone);
     Device::setInterfaceIdiomOverride(std::nullopt);
-}
 
-TEST(UiDevice, SoftwareRenderingReportsGraphicsQualityTen) {
-    testing_support::ScopedEnv env;
-    env.unset("TAMSEL_GRAPHICS_QUALITY");
     // The tests run on the offscreen platform, which renders in software.
+    env.unset("TAMSEL_GRAPHICS_QUALITY");
     EXPECT_EQ(Device::graphicsQuality(), Device::SoftwareGraphicsQuality);
     env.set("TAMSEL_GRAPHICS_QUALITY", "100");
     EXPECT_EQ(Device::graphicsQuality(), 100);
@@ -58,11 +55,9 @@ TEST(UiTapRecognizer, ATapAnywhereInTheViewCountsAndADragDoesNot) {
     ui_input::press(&root, QPointF(10, 10));
     ui_input::move(&root, QPointF(40, 10));
     ui_input::release(&root, QPointF(40, 10));
-    EXPECT_EQ(taps, 1) << "a drag is not a tap";
-
     recognizer->setEnabled(false);
     ui_input::tap(&root, QPointF(10, 10));
-    EXPECT_EQ(taps, 1);
+    EXPECT_EQ(taps, 1) << "a drag is not a tap, nor a tap on a disabled recognizer";
 }
 
 TEST(UiBackdrop, MaskViewsShapeTheBackdrop) {
@@ -75,22 +70,19 @@ TEST(UiBackdrop, MaskViewsShapeTheBackdrop) {
     // A ring-shaped image: opaque outside a disc, as the overlay's mask is.
     QImage outside(100, 100, QImage::Format_ARGB32_Premultiplied);
     outside.fill(Qt::black);
-    {
-        QPainter painter(&outside);
-        painter.setCompositionMode(QPainter::CompositionMode_Clear);
-        painter.setRenderHint(QPainter::Antialiasing);
-        painter.setBrush(Qt::black);
-        painter.drawEllipse(QRectF(0, 0, 100, 100));
-    }
+    QPainter painter(&outside);
+    painter.setCompositionMode(QPainter::CompositionMode_Clear);
+    painter.setBrush(Qt::black);
+    painter.drawEllipse(QRectF(0, 0, 100, 100));
+    painter.end();
     auto* shape = new ImageView(outside);
     root.addSubview(shape);
     shape->setAlpha(0.0);
     backdrop->addMaskView(shape, BackdropView::MaskShape | BackdropView::MaskIgnoresAlpha |
                                      BackdropView::MaskInverted);
 
-    QImage mask = backdrop->maskImage(1.0);
-    EXPECT_EQ(qAlpha(mask.pixel(50, 50)), 255);
-    EXPECT_EQ(qAlpha(mask.pixel(1, 1)), 0);
+    EXPECT_EQ(qAlpha(backdrop->maskImage(1.0).pixel(50, 50)), 255);
+    EXPECT_EQ(qAlpha(backdrop->maskImage(1.0).pixel(1, 1)), 0);
 
     // Without ignoring alpha, an invisible view adds nothing.
     backdrop->addMaskView(shape, BackdropView::MaskShape | BackdropView::MaskInverted);

@@ -10,6 +10,7 @@
 
 using platform::ActivityIndicator;
 using platform::View;
+using platform::ViewAlpha::presentationAlpha;
 using testing_support::waitUntil;
 
 namespace {
@@ -17,85 +18,61 @@ namespace {
 struct Screen {
     Screen() : root(QRectF(0, 0, 320, 480)) {
         root.show();
-        overlay = platform::ViewHandle<TXYouTubeActivityProgressOverlay>(
-            new TXYouTubeActivityProgressOverlay(QRectF(20, 40, 200, 100)));
         root.addSubview(overlay.get());
     }
     // Plain child views: the dimming layers.
     int dimmingLayers() const {
-        int count = 0;
-        for (QObject* child : overlay->children())
-            if (child->metaObject() == &View::staticMetaObject)
-                ++count;
-        return count;
+        return int(std::count_if(
+            overlay->children().begin(), overlay->children().end(),
+            [](QObject* child) { return child->metaObject() == &View::staticMetaObject; }));
     }
     bool spinnerShown() const {
         return overlay->activityIndicator() &&
                overlay->activityIndicator()->parentWidget() == overlay.get();
     }
+    void deleteDeferred() { QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete); }
     View root;
-    platform::ViewHandle<TXYouTubeActivityProgressOverlay> overlay;
+    platform::ViewHandle<TXYouTubeActivityProgressOverlay> overlay{
+        new TXYouTubeActivityProgressOverlay(QRectF(20, 40, 200, 100))};
 };
 
 } // namespace
 
-TEST(UiProgressOverlay, ShowingFadesInOnceThenCentresASpinningIndicator) {
-    Screen screen;
-    screen.overlay->setShowing_animated(true, true);
-    screen.overlay->setShowing_animated(true, true);
+TEST(UiProgressOverlay, ShowingFadesInOnceThenCentresASpinningIndicatorUntilStopped) {
+    for (bool animated : {true, false}) {
+        SCOPED_TRACE(animated);
+        Screen screen;
+        screen.overlay->setShowing_animated(true, animated);
+        screen.overlay->setShowing_animated(true, animated);
+        EXPECT_TRUE(screen.overlay->isShowing());
+        EXPECT_EQ(screen.dimmingLayers(), 1);
+        EXPECT_TRUE(platform::Animation::isAnimating(screen.overlay.get())) << "it always fades";
+        EXPECT_LT(presentationAlpha(screen.overlay.get()), 1.0);
+        EXPECT_EQ(screen.overlay->activityIndicator(), nullptr);
+        screen.overlay->stopActivity(); // before the fade-in ends: removes nothing
 
-    EXPECT_TRUE(screen.overlay->isShowing());
-    EXPECT_EQ(screen.dimmingLayers(), 1);
-    EXPECT_TRUE(platform::Animation::isAnimating(screen.overlay.get()));
-    EXPECT_LT(platform::ViewAlpha::presentationAlpha(screen.overlay.get()), 1.0);
-    EXPECT_EQ(screen.overlay->activityIndicator(), nullptr);
+        ASSERT_TRUE(waitUntil([&] { return screen.spinnerShown(); }));
+        QPointer<ActivityIndicator> spinner = screen.overlay->activityIndicator();
+        EXPECT_TRUE(spinner->isAnimating());
+        EXPECT_EQ(spinner->style(), ActivityIndicator::Style::WhiteLarge);
+        // Centred in the overlay's own bounds, whatever its origin in the screen.
+        EXPECT_EQ(spinner->center(), QPointF(100, 50));
+        EXPECT_DOUBLE_EQ(presentationAlpha(screen.overlay.get()), 1.0);
 
-    ASSERT_TRUE(waitUntil([&] { return screen.spinnerShown(); }));
-    ActivityIndicator* spinner = screen.overlay->activityIndicator();
-    EXPECT_TRUE(spinner->isAnimating());
-    EXPECT_EQ(spinner->style(), ActivityIndicator::Style::WhiteLarge);
-    // Centred in the overlay's own bounds, whatever its origin in the screen.
-    EXPECT_EQ(spinner->center(), QPointF(100, 50));
-    EXPECT_DOUBLE_EQ(platform::ViewAlpha::presentationAlpha(screen.overlay.get()), 1.0);
-    EXPECT_EQ(screen.dimmingLayers(), 1);
-}
-
-TEST(UiProgressOverlay, ShowingWithoutAnimationStillFadesIn) {
-    Screen screen;
-    screen.overlay->setShowing_animated(true, false);
-    EXPECT_TRUE(platform::Animation::isAnimating(screen.overlay.get()));
-    EXPECT_FALSE(screen.spinnerShown());
-    EXPECT_TRUE(waitUntil([&] { return screen.spinnerShown(); }));
-}
-
-TEST(UiProgressOverlay, StoppingBeforeTheFadeInEndsRemovesNothing) {
-    Screen screen;
-    screen.overlay->setShowing_animated(true, true);
-    screen.overlay->stopActivity();
-    EXPECT_TRUE(waitUntil([&] { return screen.spinnerShown(); }));
-}
-
-TEST(UiProgressOverlay, StoppingTakesTheSpinnerOffAndKeepsTheDimming) {
-    Screen screen;
-    screen.overlay->setShowing_animated(true, true);
-    ASSERT_TRUE(waitUntil([&] { return screen.spinnerShown(); }));
-    QPointer<ActivityIndicator> spinner = screen.overlay->activityIndicator();
-
-    screen.overlay->stopActivity();
-    QCoreApplication::sendPostedEvents(nullptr,
-                                       QEvent::DeferredDelete); // would delete a dropped spinner
-    ASSERT_TRUE(spinner);
-    EXPECT_EQ(spinner->parentWidget(), nullptr);
-    EXPECT_EQ(screen.overlay->activityIndicator(), spinner.data());
-    EXPECT_EQ(screen.dimmingLayers(), 1);
-    EXPECT_EQ(screen.overlay->parentWidget(), &screen.root);
+        screen.overlay->stopActivity();
+        screen.deleteDeferred(); // would delete a dropped spinner
+        ASSERT_TRUE(spinner);
+        EXPECT_EQ(spinner->parentWidget(), nullptr);
+        EXPECT_EQ(screen.overlay->activityIndicator(), spinner.data());
+        EXPECT_EQ(screen.dimmingLayers(), 1);
+        EXPECT_EQ(screen.overlay->parentWidget(), &screen.root);
+    }
 }
 
 TEST(UiProgressOverlay, HidingDropsTheSpinnerAtOnceThenLeavesTheSuperview) {
     Screen screen;
     screen.overlay->setShowing_animated(true, true);
     ASSERT_TRUE(waitUntil([&] { return screen.spinnerShown(); }));
-
     screen.overlay->setShowing_animated(false, true);
     EXPECT_FALSE(screen.overlay->isShowing());
     EXPECT_FALSE(screen.spinnerShown());
@@ -105,6 +82,6 @@ TEST(UiProgressOverlay, HidingDropsTheSpinnerAtOnceThenLeavesTheSuperview) {
     // The creator's reference is the last one: letting go deletes it.
     QPointer<TXYouTubeActivityProgressOverlay> gone = screen.overlay.get();
     screen.overlay.reset();
-    QCoreApplication::sendPostedEvents(nullptr, QEvent::DeferredDelete);
+    screen.deleteDeferred();
     EXPECT_TRUE(gone.isNull());
 }

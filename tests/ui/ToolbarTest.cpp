@@ -14,10 +14,12 @@ using Item = ToolbarItem::SystemItem;
 namespace {
 
 struct Bar {
-    Bar() : root(QRectF(0, 0, 400, 200)) {
-        bar = new Toolbar(QRectF(0, 0, 400, 44));
+    Bar() : root(QRectF(0, 0, 400, 200)), bar(new Toolbar(QRectF(0, 0, 400, 44))) {
         root.addSubview(bar);
         root.show();
+    }
+    QWidget* widget(const std::shared_ptr<ToolbarItem>& item) const {
+        return bar->widgetForItem(item.get());
     }
     View root;
     Toolbar* bar;
@@ -25,48 +27,36 @@ struct Bar {
 
 } // namespace
 
-TEST(UiToolbar, ReplacingTheListReplacesEveryWidget) {
+TEST(UiToolbar, ReplacingTheListReplacesEveryWidgetAlsoFromAnItemsOwnAction) {
     Bar b;
-    int plays = 0;
-    auto play = ToolbarItem::systemItem(Item::Play, [&] { ++plays; });
+    std::shared_ptr<ToolbarItem> play, pause;
+    play = ToolbarItem::systemItem(Item::Play, [&] { b.bar->setItems({pause}); });
+    pause = ToolbarItem::systemItem(Item::Pause, [&] { b.bar->setItems({play}); });
     auto share = ToolbarItem::systemItem(Item::Action);
     auto flex = ToolbarItem::flexibleSpace();
     auto title = ToolbarItem::customViewItem(new Label(QRectF(0, 0, 120, 17)));
 
     b.bar->setItems({share, flex, title, flex, play});
-    QPointer<QWidget> oldPlay = b.bar->widgetForItem(play.get());
+    QPointer<QWidget> oldPlay = b.widget(play);
     ASSERT_TRUE(oldPlay);
-    EXPECT_EQ(b.bar->widgetForItem(flex.get()), nullptr);
-    EXPECT_EQ(b.bar->widgetForItem(title.get()), title->customView());
+    EXPECT_EQ(b.widget(flex), nullptr);
+    EXPECT_EQ(b.widget(title), title->customView());
     EXPECT_EQ(title->customView()->parentWidget(), b.bar);
 
     b.bar->setItems({flex, play, flex});
     EXPECT_EQ(b.bar->items().size(), 3);
     EXPECT_FALSE(oldPlay && oldPlay->isVisible()) << "the old widget is gone from the bar";
-    QWidget* newPlay = b.bar->widgetForItem(play.get());
-    ASSERT_NE(newPlay, nullptr);
-    EXPECT_NE(newPlay, oldPlay.data());
-    EXPECT_EQ(b.bar->widgetForItem(share.get()), nullptr);
-    EXPECT_EQ(title->customView()->parentWidget(), nullptr)
-        << "a custom view goes back to its item";
+    ASSERT_NE(b.widget(play), nullptr);
+    EXPECT_NE(b.widget(play), oldPlay.data());
+    EXPECT_EQ(b.widget(share), nullptr);
+    EXPECT_EQ(title->customView()->parentWidget(), nullptr) << "a custom view goes back";
 
-    ui_input::tap(newPlay);
-    EXPECT_EQ(plays, 1);
-}
-
-TEST(UiToolbar, AnItemMayReplaceTheListFromItsOwnAction) {
-    Bar b;
-    std::shared_ptr<ToolbarItem> play, pause;
-    play = ToolbarItem::systemItem(Item::Play, [&] { b.bar->setItems({pause}); });
-    pause = ToolbarItem::systemItem(Item::Pause, [&] { b.bar->setItems({play}); });
-    b.bar->setItems({play});
-    ui_input::tap(b.bar->widgetForItem(play.get()));
+    ui_input::tap(b.widget(play));
     QCoreApplication::processEvents();
-    ASSERT_EQ(b.bar->items().size(), 1);
-    EXPECT_EQ(b.bar->items().first(), pause);
-    ui_input::tap(b.bar->widgetForItem(pause.get()));
+    EXPECT_EQ(b.bar->items(), Toolbar::ItemList{pause});
+    ui_input::tap(b.widget(pause));
     QCoreApplication::processEvents();
-    EXPECT_EQ(b.bar->items().first(), play);
+    EXPECT_EQ(b.bar->items(), Toolbar::ItemList{play});
 }
 
 TEST(UiToolbar, SpacesDivideTheWidthAndItemsKeepTheirOrder) {
@@ -76,25 +66,20 @@ TEST(UiToolbar, SpacesDivideTheWidthAndItemsKeepTheirOrder) {
     auto play = ToolbarItem::systemItem(Item::Play);
     auto flex = ToolbarItem::flexibleSpace();
     b.bar->setItems({cancel, flex, play, flex, save});
-
-    const QRect left = b.bar->widgetForItem(cancel.get())->geometry();
-    const QRect middle = b.bar->widgetForItem(play.get())->geometry();
-    const QRect right = b.bar->widgetForItem(save.get())->geometry();
+    const QRect left = b.widget(cancel)->geometry();
+    const QRect middle = b.widget(play)->geometry();
+    const QRect right = b.widget(save)->geometry();
     EXPECT_LT(left.right(), middle.left());
     EXPECT_LT(middle.right(), right.left());
     EXPECT_NEAR(middle.center().x(), 200, 30) << "two flexible spaces centre the middle item";
     EXPECT_NEAR(right.right(), 400 - 12, 2);
 
-    auto fixed = ToolbarItem::fixedSpace(50);
-    b.bar->setItems({play, fixed, save});
-    const int gap = b.bar->widgetForItem(save.get())->geometry().left() -
-                    b.bar->widgetForItem(play.get())->geometry().right() - 1;
-    EXPECT_GE(gap, 50);
+    b.bar->setItems({play, ToolbarItem::fixedSpace(50), save});
+    EXPECT_GE(b.widget(save)->geometry().left() - b.widget(play)->geometry().right() - 1, 50);
 }
 
 TEST(UiToolbar, TitlesAreLocalisedAndEveryButtonIsNamedAndReachable) {
-    testing_support::ScopedEnv env;
-    env.set("LC_ALL", "de_DE.UTF-8");
+    testing_support::ScopedEnv env("LC_ALL", "de_DE.UTF-8");
     env.set("LANGUAGE", "de");
     Bar b;
     int shares = 0;
@@ -106,16 +91,14 @@ TEST(UiToolbar, TitlesAreLocalisedAndEveryButtonIsNamedAndReachable) {
     EXPECT_TRUE(share->showsIcon());
     b.bar->setItems({done, ToolbarItem::flexibleSpace(), share, play});
 
-    QWidget* shareButton = b.bar->widgetForItem(share.get());
-    EXPECT_EQ(shareButton->accessibleName(), QStringLiteral("Teilen"));
-    EXPECT_EQ(b.bar->widgetForItem(play.get())->accessibleName(), QStringLiteral("Wiedergabe"));
-    EXPECT_EQ(b.bar->widgetForItem(done.get())->nextInFocusChain(), shareButton);
-    EXPECT_EQ(shareButton->nextInFocusChain(), b.bar->widgetForItem(play.get()));
-    EXPECT_EQ(shareButton->focusPolicy(), Qt::TabFocus)
+    EXPECT_EQ(b.widget(share)->accessibleName(), QStringLiteral("Teilen"));
+    EXPECT_EQ(b.widget(play)->accessibleName(), QStringLiteral("Wiedergabe"));
+    EXPECT_EQ(b.widget(done)->nextInFocusChain(), b.widget(share));
+    EXPECT_EQ(b.widget(share)->nextInFocusChain(), b.widget(play));
+    EXPECT_EQ(b.widget(share)->focusPolicy(), Qt::TabFocus)
         << "a click must not take the focus from where the user's keys go";
-
-    shareButton->setFocus();
-    ui_input::key(shareButton, Qt::Key_Space);
+    b.widget(share)->setFocus();
+    ui_input::key(b.widget(share), Qt::Key_Space);
     EXPECT_EQ(shares, 1);
 }
 
@@ -126,15 +109,13 @@ TEST(UiToolbar, ItemsTakeTheBarsTintUnlessTheyHaveTheirOwn) {
     cancel->setTintColor(Qt::red);
     b.bar->setItems({cancel, save});
     b.bar->setTintColor(QColor(10, 120, 30));
-    auto* saveButton = qobject_cast<ToolbarItemButton*>(b.bar->widgetForItem(save.get()));
-    auto* cancelButton = qobject_cast<ToolbarItemButton*>(b.bar->widgetForItem(cancel.get()));
-    ASSERT_TRUE(saveButton && cancelButton);
-    EXPECT_EQ(saveButton->effectiveTint(), QColor(10, 120, 30));
-    EXPECT_EQ(cancelButton->effectiveTint(), QColor(Qt::red));
-    // The list a new bar is given is tinted too.
-    b.bar->setItems({save});
-    EXPECT_EQ(qobject_cast<ToolbarItemButton*>(b.bar->widgetForItem(save.get()))->effectiveTint(),
-              QColor(10, 120, 30));
+    const auto tint = [&](const auto& item) {
+        return qobject_cast<ToolbarItemButton*>(b.widget(item))->effectiveTint();
+    };
+    EXPECT_EQ(tint(save), QColor(10, 120, 30));
+    EXPECT_EQ(tint(cancel), QColor(Qt::red));
+    b.bar->setItems({save}); // a new list is tinted too
+    EXPECT_EQ(tint(save), QColor(10, 120, 30));
 }
 
 TEST(UiToolbar, ReplacingTheListKeepsTheKeyboardWhereItWas) {
@@ -144,15 +125,37 @@ TEST(UiToolbar, ReplacingTheListKeepsTheKeyboardWhereItWas) {
     auto share = ToolbarItem::systemItem(Item::Action);
     auto title = ToolbarItem::customViewItem(new Label(QRectF(0, 0, 120, 17)));
     b.bar->setItems({play, share});
-    b.bar->widgetForItem(play.get())->setFocus();
+    b.widget(play)->setFocus();
 
     b.bar->setItems({pause, share}); // what a press on play does
-    EXPECT_EQ(b.root.focusWidget(), b.bar->widgetForItem(pause.get())) << "the same place";
+    EXPECT_EQ(b.root.focusWidget(), b.widget(pause)) << "the same place";
     b.bar->setItems({share, pause});
-    EXPECT_EQ(b.root.focusWidget(), b.bar->widgetForItem(pause.get())) << "the same item";
+    EXPECT_EQ(b.root.focusWidget(), b.widget(pause)) << "the same item";
     b.bar->setItems({share, title});
     EXPECT_EQ(b.root.focusWidget(), nullptr) << "a title takes no focus; nor does the next item";
-
     b.bar->setItems({play, share}); // nothing had the focus: nothing takes it
     EXPECT_EQ(b.root.focusWidget(), nullptr);
+}
+
+TEST(UiToolbar, ImageInsetsMoveTheIcon) {
+    Bar b;
+    auto plain = ToolbarItem::systemItem(Item::Play);
+    auto moved = ToolbarItem::systemItem(Item::Play);
+    moved->setImageInsets(QMarginsF(0, 8, 0, -8)); // left, top, right, bottom
+    b.bar->setItems({plain, moved});
+    b.bar->setTintColor(Qt::black);
+    // The mean row of the icon's ink, in each button's own picture.
+    const auto inkRow = [&](const auto& item) {
+        QImage image(b.widget(item)->size(), QImage::Format_ARGB32_Premultiplied);
+        image.fill(Qt::transparent);
+        b.widget(item)->render(&image, QPoint(), QRegion(), QWidget::RenderFlags());
+        double sum = 0, count = 0;
+        for (int y = 0; y < image.height(); ++y)
+            for (int x = 0; x < image.width(); ++x)
+                if (qAlpha(image.pixel(x, y)) > 128)
+                    sum += y, ++count;
+        return count > 0 ? sum / count : -1.0;
+    };
+    ASSERT_GT(inkRow(plain), 0);
+    EXPECT_NEAR(inkRow(moved) - inkRow(plain), 8.0, 1.0);
 }

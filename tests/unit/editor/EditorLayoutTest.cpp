@@ -12,41 +12,42 @@ TEST_F(EditorLayout, TheWideLayoutHasOneBarAndTheCompactOneTwo) {
     makeEditor();
     EXPECT_TRUE(editor->isPadMode());
     EXPECT_EQ(editor->bottomToolBar->superview(), nullptr);
-    EXPECT_EQ(topItems(), (QStringList{"cancelButton", "flexSpace", "titleButton", "flexSpace",
-                                       "shareButton", "fixSpace", "saveButton"}))
+    EXPECT_EQ(top(), "cancel | title | share - save")
         << "no play button in the toolbar while the overlay button is up";
 
     editor->applyPhoneUILayout();
     EXPECT_FALSE(editor->isPadMode());
     EXPECT_EQ(editor->bottomToolBar->superview(), editor->view());
-    EXPECT_EQ(topItems(),
-              (QStringList{"cancelButton", "flexSpace", "titleButton", "flexSpace", "saveButton"}));
-    EXPECT_EQ(bottomItems(), (QStringList{"shareButton", "flexSpace"}));
+    EXPECT_EQ(top(), "cancel | title | save");
+    EXPECT_EQ(bottom(), "share |");
 
+    // Play and pause change only the bottom bar.
     editor->playAction();
+    EXPECT_EQ(bottom(), "share | pause |");
     editor->pauseAction();
+    EXPECT_EQ(bottom(), "share | play |");
+    EXPECT_EQ(top(), "cancel | title | save");
+
     editor->applyPadUILayout();
     EXPECT_EQ(editor->bottomToolBar->superview(), nullptr);
-    EXPECT_EQ(topItems(),
-              (QStringList{"cancelButton", "flexSpace", "titleButton", "flexSpace", "playButton",
-                           "fixSpace", "shareButton", "fixSpace", "saveButton"}));
+    EXPECT_EQ(top(), "cancel | title | play - share - save");
 }
 
 TEST_F(EditorLayout, APhoneFollowsTheWindowsShapeAndATransitionRemakesTheThumbnails) {
     Device::setInterfaceIdiomOverride(Device::InterfaceIdiom::Phone);
     makeEditor();
-    editor->view()->resize(400, 300);
-    auto toWide = TransitionCoordinator::make(0, false);
-    editor->viewWillTransitionToSize_withTransitionCoordinator(QSizeF(400, 300), *toWide);
-    toWide->run();
+    const auto transition = [&](QSize size) {
+        editor->view()->resize(size);
+        auto coordinator = TransitionCoordinator::make(0, false);
+        editor->viewWillTransitionToSize_withTransitionCoordinator(QSizeF(size), *coordinator);
+        coordinator->run();
+    };
+    transition(QSize(400, 300));
     EXPECT_TRUE(editor->isPadMode()) << "a phone on its side gets the wide layout";
 
     editor->movieScrubber_requestThumbnailImageForTimestamp(editor->avTrimmer.get(), 1.0);
     const std::shared_ptr<ImageGenerator> old = editor->thumbnailGenerator;
-    editor->view()->resize(300, 600);
-    auto toTall = TransitionCoordinator::make(0, false);
-    editor->viewWillTransitionToSize_withTransitionCoordinator(QSizeF(300, 600), *toTall);
-    toTall->run();
+    transition(QSize(300, 600));
     EXPECT_FALSE(editor->isPadMode());
     EXPECT_EQ(editor->bottomToolBar->superview(), editor->view());
     EXPECT_NE(editor->thumbnailGenerator, old) << "thumbnails are made again at the new size";

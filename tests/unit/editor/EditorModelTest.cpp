@@ -11,65 +11,49 @@ using namespace platform;
 
 using EditorModel = EditorOnFakes;
 
-TEST_F(EditorModel, ComesUpInIntroModeWithTheWholeMovieAsItsRange) {
-    makeEditor();
+TEST_F(EditorModel, ComesUpInIntroModeAndTakesTheWholeMovieOnceItsItemIsReady) {
+    editor =
+        TXVideoEditorViewController::initWithBundleIdentifier_URL_applicationName_overrideTintColor(
+            "org.example.Racer", recording, "Racer", QColor(200, 30, 30));
     TXVideoEditorViewController& e = *editor;
+    EXPECT_DOUBLE_EQ(e.editEndTime, 0.0);
+    EXPECT_TRUE(e.avTrimmer->delegate().expired());
+    EXPECT_TRUE(std::isnan(e.getPlayerDuration()));
+    settle();
+
     EXPECT_TRUE(e.isIntroMode());
-    EXPECT_FALSE(e.isUIHidden());
-    EXPECT_FALSE(e.hasEdit());
-    EXPECT_FALSE(e.isTrimming() || e.isExporting() || e.isScrubbing());
+    EXPECT_FALSE(e.isUIHidden() || e.hasEdit() || e.isTrimming() || e.isExporting() ||
+                 e.isScrubbing());
     EXPECT_TRUE(e.activityTypes.isEmpty());
     EXPECT_EQ(e.originalVideoURL, recording);
     EXPECT_EQ(e.videoURL, recording);
     EXPECT_EQ(e.titleLabel->text(), "Racer");
-    EXPECT_EQ(e.videoOverlayPlayButtonView->parentWidget(), e.view())
-        << "the play button stands over the video";
-    EXPECT_EQ(player().seeks(), QList<MediaTime>{MediaTime::zero()}) << "playback starts at zero";
+    EXPECT_EQ(e.topToolBar->tintColor(), QColor(200, 30, 30));
+    EXPECT_FALSE(e.bottomToolBar->tintColor().isValid()) << "only the top bar takes the tint";
+    EXPECT_EQ(e.videoOverlayPlayButtonView->parentWidget(), e.view());
+    EXPECT_EQ(player().seeks(), QList<MediaTime>{MediaTime::zero()});
     EXPECT_EQ(player().rate(), 0.0f);
-
-    // Once the item is ready the range is the whole movie and the scrubber
-    // has its delegate and data source.
     EXPECT_DOUBLE_EQ(e.editStartTime, 0.0);
     EXPECT_DOUBLE_EQ(e.editEndTime, 10.0);
     EXPECT_EQ(e.avTrimmer->delegate().lock().get(), static_cast<MovieScrubberDelegate*>(&e));
     EXPECT_EQ(e.avTrimmer->dataSource().lock().get(), static_cast<MovieScrubberDataSource*>(&e));
 }
 
-TEST_F(EditorModel, BeforeItsItemIsReadyTheRangeIsZeroAndTheScrubberHasNoDelegate) {
-    editor = TXVideoEditorViewController::initWithBundleIdentifier_URL_applicationName(
-        "org.example.Racer", recording, "Racer");
-    EXPECT_DOUBLE_EQ(editor->editEndTime, 0.0);
-    EXPECT_TRUE(editor->avTrimmer->delegate().expired());
-    EXPECT_TRUE(std::isnan(editor->getPlayerDuration()));
-}
-
-TEST_F(EditorModel, AMovieThatFailsToLoadLeavesTheScrubberAlone) {
-    makeEditor(QColor(), QUrl::fromLocalFile("/recordings/gone.mp4"));
-    EXPECT_EQ(editor->avPlayer->currentItem()->status(), PlayerItem::Status::Failed);
-    EXPECT_DOUBLE_EQ(editor->editEndTime, 0.0);
-    EXPECT_TRUE(editor->avTrimmer->delegate().expired());
-    EXPECT_TRUE(editor->avTrimmer->dataSource().expired());
-    editor->undoAction(); // no delegate to send to: nothing happens
-    EXPECT_FALSE(editor->isTrimming());
-}
-
-TEST_F(EditorModel, ANullURLBuildsTheSameEditor) {
-    editor = TXVideoEditorViewController::initWithBundleIdentifier_URL_applicationName(
-        "org.example.Racer", QUrl(), "Racer");
-    settle();
-    EXPECT_TRUE(editor->isIntroMode());
-    EXPECT_EQ(editor->avPlayer->currentItem()->status(), PlayerItem::Status::Failed);
-    EXPECT_TRUE(editor->topToolBar->items().contains(editor->cancelButton));
-}
-
-TEST_F(EditorModel, OnlyTheTopBarTakesTheTint) {
-    makeEditor(QColor(200, 30, 30));
-    EXPECT_EQ(editor->topToolBar->tintColor(), QColor(200, 30, 30));
-    EXPECT_FALSE(editor->bottomToolBar->tintColor().isValid());
-
-    makeEditor();
-    EXPECT_FALSE(editor->topToolBar->tintColor().isValid());
-    EXPECT_FALSE(editor->bottomToolBar->tintColor().isValid());
+TEST_F(EditorModel, AMovieThatFailsToLoadOrNoURLGivesAnEditorThatLeavesTheScrubberAlone) {
+    for (const QUrl& url : {QUrl::fromLocalFile("/recordings/gone.mp4"), QUrl()}) {
+        SCOPED_TRACE(url.toString().toStdString());
+        editor = TXVideoEditorViewController::initWithBundleIdentifier_URL_applicationName(
+            "org.example.Racer", url, "Racer");
+        settle();
+        EXPECT_TRUE(editor->isIntroMode());
+        EXPECT_EQ(top(), "cancel | title | share - save");
+        EXPECT_EQ(editor->avPlayer->currentItem()->status(), PlayerItem::Status::Failed);
+        EXPECT_DOUBLE_EQ(editor->editEndTime, 0.0);
+        EXPECT_TRUE(editor->avTrimmer->delegate().expired());
+        EXPECT_TRUE(editor->avTrimmer->dataSource().expired());
+        editor->undoAction(); // no delegate to send to: nothing happens
+        EXPECT_FALSE(editor->isTrimming());
+    }
 }
 
 TEST_F(EditorModel, TearDownStopsEveryObservationAndRemovesTheTrimmedClip) {
@@ -101,12 +85,11 @@ TEST_F(EditorModel, TearDownStopsEveryObservationAndRemovesTheTrimmedClip) {
 
 TEST_F(EditorModel, CancelAndDoneBothPauseAndReportTheLiveList) {
     makeEditor();
+    EXPECT_FALSE(editor->topToolBar->tintColor().isValid());
     editor->activityTypes.append(MailActivityType);
     editor->avPlayer->play();
     editor->cancelButton->trigger();
     EXPECT_EQ(editor->avPlayer->rate(), 0.0f);
     editor->doneButton->trigger();
-    ASSERT_EQ(delegate->reports.size(), 2);
-    EXPECT_EQ(delegate->reports[0], QStringList{MailActivityType});
-    EXPECT_EQ(delegate->reports[1], delegate->reports[0]);
+    EXPECT_EQ(delegate->reports, (QList<QStringList>(2, {MailActivityType})));
 }

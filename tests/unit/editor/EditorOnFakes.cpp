@@ -43,27 +43,21 @@ fakes::FakePlayer& EditorOnFakes::player() const {
     return dynamic_cast<fakes::FakePlayer&>(*editor->avPlayer);
 }
 
-QStringList EditorOnFakes::names(const QList<std::shared_ptr<ToolbarItem>>& items) const {
+std::string EditorOnFakes::bar(const Toolbar& toolbar) const {
     const TXVideoEditorViewController& e = *editor;
-    const QList<std::pair<const char*, std::shared_ptr<ToolbarItem>>> table = {
-        {"shareButton", e.shareButton},
-        {"pauseButton", e.pauseButton},
-        {"saveButton", e.saveButton},
-        {"flexSpace", e.flexSpace},
-        {"doneButton", e.doneButton},
-        {"cancelButton", e.cancelButton},
-        {"cancelTrimButton", e.cancelTrimButton},
-        {"trimButton", e.trimButton},
-        {"titleButton", e.titleButton},
-        {"playButton", e.playButton},
-        {"fixSpace", e.fixSpace},
-        {"undoButton", e.undoButton}};
+    const QList<std::pair<const char*, std::shared_ptr<ToolbarItem>>> names = {
+        {"share", e.shareButton}, {"pause", e.pauseButton},
+        {"save", e.saveButton},   {"|", e.flexSpace},
+        {"done", e.doneButton},   {"cancel", e.cancelButton},
+        {"trim", e.trimButton},   {"cancelTrim", e.cancelTrimButton},
+        {"title", e.titleButton}, {"play", e.playButton},
+        {"-", e.fixSpace},        {"undo", e.undoButton}};
     QStringList out;
-    for (const auto& item : items)
-        for (const auto& [name, candidate] : table)
+    for (const auto& item : toolbar.items())
+        for (const auto& [name, candidate] : names)
             if (candidate == item)
                 out.append(name);
-    return out;
+    return out.join(' ').toStdString();
 }
 
 QStringList EditorOnFakes::filesOnDevice() const {

@@ -37,10 +37,11 @@ class EditorOnFakes : public ::testing::Test {
     static void drainQueues();
 
     fakes::FakePlayer& player() const;
-    // The names of the editor's toolbar items, for readable comparisons.
-    QStringList names(const QList<std::shared_ptr<platform::ToolbarItem>>& items) const;
-    QStringList topItems() const { return names(editor->topToolBar->items()); }
-    QStringList bottomItems() const { return names(editor->bottomToolBar->items()); }
+    // A bar's items in short: buttons without "Button", "|" a flexible and
+    // "-" a fixed space ("cancel | title | share - save").
+    std::string top() const { return bar(*editor->topToolBar); }
+    std::string bottom() const { return bar(*editor->bottomToolBar); }
+    std::string bar(const platform::Toolbar& toolbar) const;
     // Every file under the mobile root, the editor's temporary directory
     // included.
     QStringList filesOnDevice() const;

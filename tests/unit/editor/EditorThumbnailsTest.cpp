@@ -24,9 +24,7 @@ TEST_F(EditorThumbnails, TimeStampsAreEvenlySpacedAndStopPastTheDuration) {
 
 TEST_F(EditorThumbnails, AQuarterTurnSwapsTheSizeAndNoVideoHasNone) {
     const QUrl portrait = QUrl::fromLocalFile("/recordings/portrait.mp4");
-    fakes::FakeMovie turned;
-    turned.rotationDegrees = 90;
-    fakes.world().addMovie(portrait, turned);
+    fakes.world().addMovie(portrait, {.rotationDegrees = 90});
     makeEditor(QColor(), portrait);
     EXPECT_EQ(editor->getVideoSize(), QSizeF(240, 320));
     EXPECT_FLOAT_EQ(editor->movieScrubberThumbnailAspectRatio(editor->avTrimmer.get()), 0.75f);
@@ -34,29 +32,32 @@ TEST_F(EditorThumbnails, AQuarterTurnSwapsTheSizeAndNoVideoHasNone) {
     EXPECT_EQ(editor->getThumbnailSize(), QSizeF(std::rint(0.75 * 38 * k) * k, 38 * k));
 
     const QUrl sound = QUrl::fromLocalFile("/recordings/sound.mp4");
-    fakes::FakeMovie audioOnly;
-    audioOnly.video = false;
-    fakes.world().addMovie(sound, audioOnly);
+    fakes.world().addMovie(sound, {.video = false});
     makeEditor(QColor(), sound);
     EXPECT_EQ(editor->getVideoSize(), QSizeF(0, 0));
     EXPECT_FLOAT_EQ(editor->movieScrubberThumbnailAspectRatio(editor->avTrimmer.get()), 1.0f);
 }
 
 TEST_F(EditorThumbnails, EachStampIsMadeOnceAtTheThumbnailSizeAndThenServedFromTheCache) {
+    fakes.world().change([](auto& world) { world.failingTimes = {3.0}; });
     makeEditor();
     drainQueues(); // what the scrubber asked for when the item became ready
-    const int before = fakes.world().generatedTimes().size();
+    const auto made = [&] { return fakes.world().state().generatedTimes; };
+    const int before = made().size();
+    const auto request = [&](double stamp) {
+        editor->movieScrubber_requestThumbnailImageForTimestamp(editor->avTrimmer.get(), stamp);
+        drainQueues();
+    };
 
-    editor->movieScrubber_requestThumbnailImageForTimestamp(editor->avTrimmer.get(), 2.5);
-    drainQueues();
-    EXPECT_EQ(fakes.world().generatedTimes().size(), before + 1);
-    EXPECT_EQ(fakes.world().lastMaximumSize(), editor->getThumbnailSize());
+    request(2.5);
+    EXPECT_EQ(made().size(), before + 1);
+    EXPECT_EQ(fakes.world().state().lastMaximumSize, editor->getThumbnailSize());
     ASSERT_TRUE(editor->cachedTimeStamps->contains(2.5));
     EXPECT_FALSE(editor->cachedTimeStamps->value(2.5).isNull());
-
-    editor->movieScrubber_requestThumbnailImageForTimestamp(editor->avTrimmer.get(), 2.5);
-    drainQueues();
-    EXPECT_EQ(fakes.world().generatedTimes().size(), before + 1) << "a cache hit decodes nothing";
+    request(2.5);
+    EXPECT_EQ(made().size(), before + 1) << "a cache hit decodes nothing";
+    request(3.0);
+    EXPECT_FALSE(editor->cachedTimeStamps->contains(3.0)) << "a frame that cannot be made";
 
     // A size change drops generator and cache (the scrubber's reload at once
     // asks again, of a new generator): the stamp is made again.
@@ -65,15 +66,6 @@ TEST_F(EditorThumbnails, EachStampIsMadeOnceAtTheThumbnailSizeAndThenServedFromT
     EXPECT_NE(editor->thumbnailGenerator, old);
     EXPECT_FALSE(editor->cachedTimeStamps->contains(2.5));
     drainQueues();
-    editor->movieScrubber_requestThumbnailImageForTimestamp(editor->avTrimmer.get(), 2.5);
-    drainQueues();
-    EXPECT_EQ(fakes.world().generatedTimes().count(2.5), 2);
-}
-
-TEST_F(EditorThumbnails, AFrameThatCannotBeMadeLeavesItsSlotEmpty) {
-    fakes.world().failGenerationAt(3.0);
-    makeEditor();
-    editor->movieScrubber_requestThumbnailImageForTimestamp(editor->avTrimmer.get(), 3.0);
-    drainQueues();
-    EXPECT_FALSE(editor->cachedTimeStamps->contains(3.0));
+    request(2.5);
+    EXPECT_EQ(made().count(2.5), 2);
 }

@@ -8,7 +8,7 @@ using namespace platform;
 using testing_support::LogCapture;
 using testing_support::LogLine;
 
-TEST(Log, LinesReachTheInstalledSinkWithTheirLevelAndObserversSeeThemToo) {
+TEST(Log, LinesReachTheInstalledSinkWithTheirLevelObserversSeeThemAndCapturesNest) {
     QList<LogLine> observed;
     LogCapture capture;
     const int token = addLogObserver([&](LogLevel level, const QString& text) {
@@ -18,24 +18,17 @@ TEST(Log, LinesReachTheInstalledSinkWithTheirLevelAndObserversSeeThemToo) {
     logError("two: 5");
     logConsole("error = three");
     removeLogObserver(token);
-    logDefault("four");
-
-    const QList<LogLine> expected{{LogLevel::Default, "one"},
-                                  {LogLevel::Error, "two: 5"},
-                                  {LogLevel::Console, "error = three"}};
-    EXPECT_EQ(capture.lines(), expected + QList<LogLine>({{LogLevel::Default, "four"}}));
-    EXPECT_EQ(observed, expected);
-}
-
-TEST(Log, NestedCapturesRestoreTheSinkBeforeThem) {
-    LogCapture outer;
     {
         LogCapture inner;
         logDefault("inner");
         EXPECT_EQ(inner.texts(), QStringList{"inner"});
     }
-    logDefault("outer");
-    EXPECT_EQ(outer.texts(), QStringList{"outer"});
+    logDefault("four");
+    const QList<LogLine> expected{{LogLevel::Default, "one"},
+                                  {LogLevel::Error, "two: 5"},
+                                  {LogLevel::Console, "error = three"}};
+    EXPECT_EQ(capture.lines(), expected + QList<LogLine>({{LogLevel::Default, "four"}}));
+    EXPECT_EQ(observed, expected);
 }
 
 TEST(Error, CarriesCodeAndDescribesItselfAndEachErrorHasItsOwnIdentity) {

@@ -13,7 +13,16 @@
 using namespace platform;
 using testing_support::ScopedEnv;
 
-TEST(StringsTable, ReadsQuotedAndBareKeysCommentsAndEscapes) {
+namespace {
+void write(const QString& path, const QByteArray& bytes) {
+    QDir().mkpath(QFileInfo(path).absolutePath());
+    QFile file(path);
+    ASSERT_TRUE(file.open(QIODevice::WriteOnly));
+    file.write(bytes);
+}
+} // namespace
+
+TEST(StringsTable, ReadsQuotedAndBareKeysCommentsEscapesAndUtf16AndRefusesMalformedTablesWhole) {
     const auto table = parseStrings(QStringLiteral(R"(/* header
    spanning lines */
 "GREETING" = "Hello, \"%@\"!";   // trailing comment
@@ -27,75 +36,60 @@ BARE_KEY = "a\nb\tc\\d";
     EXPECT_EQ(table->value("UNI").toString(), QStringLiteral("été"));
     EXPECT_TRUE(table->contains("EMPTY"));
     EXPECT_EQ(table->size(), 4);
-}
 
-TEST(StringsTable, MalformedTablesAreRefusedWhole) {
     for (const char* text :
          {R"("A" = "unterminated;)", R"("A" "B";)", R"("A" = "B")", R"("A" = ;)", "= \"x\";"})
         EXPECT_FALSE(parseStrings(QString::fromUtf8(text))) << text;
     EXPECT_TRUE(parseStrings(""));
     EXPECT_FALSE(readStringsFile("/nonexistent/Localizable.strings"));
-}
 
-TEST(StringsTable, ReadsUtf16FilesWithAByteOrderMark) {
     QTemporaryDir dir;
-    QFile file(dir.filePath("t.strings"));
-    ASSERT_TRUE(file.open(QIODevice::WriteOnly));
     QStringEncoder encoder(QStringEncoder::Utf16LE, QStringEncoder::Flag::WriteBom);
-    file.write(encoder(QStringLiteral("\"KEY\" = \"Grüße\";")));
-    file.close();
-    const auto table = readStringsFile(file.fileName());
-    ASSERT_TRUE(table);
-    EXPECT_EQ(table->value("KEY").toString(), QStringLiteral("Grüße"));
+    write(dir.filePath("t.strings"), encoder(QStringLiteral("\"KEY\" = \"Grüße\";")));
+    const auto utf16 = readStringsFile(dir.filePath("t.strings"));
+    ASSERT_TRUE(utf16);
+    EXPECT_EQ(utf16->value("KEY").toString(), QStringLiteral("Grüße"));
 }
 
 TEST(PreferredLanguages, FollowGettextOrder) {
     ScopedEnv env;
-    env.unset("LC_ALL");
-    env.unset("LC_MESSAGES");
-    env.unset("LANGUAGE");
-    env.set("LANG", "de_AT.UTF-8");
-    EXPECT_EQ(preferredLanguages(), QStringList{"de-AT"});
-
-    env.set("LANGUAGE", "fr_CA:de::fr_CA");
-    EXPECT_EQ(preferredLanguages(), (QStringList{"fr-CA", "de"}));
-
-    env.set("LC_MESSAGES", "ja_JP.UTF-8");
-    env.unset("LANGUAGE");
-    EXPECT_EQ(preferredLanguages(), QStringList{"ja-JP"});
-    env.set("LC_ALL", "es_ES.UTF-8@euro");
-    EXPECT_EQ(preferredLanguages(), QStringList{"es-ES"});
-
-    // LANGUAGE means nothing in the C locale.
-    env.set("LC_ALL", "C");
-    env.set("LANGUAGE", "de");
-    EXPECT_TRUE(preferredLanguages().isEmpty());
-    env.set("LC_ALL", "POSIX");
-    EXPECT_TRUE(preferredLanguages().isEmpty());
+    const struct {
+        const char *all, *messages, *language, *lang;
+        QStringList expected;
+    } cases[] = {
+        {nullptr, nullptr, nullptr, "de_AT.UTF-8", {"de-AT"}},
+        {nullptr, nullptr, "fr_CA:de::fr_CA", "de_AT.UTF-8", {"fr-CA", "de"}},
+        {nullptr, "ja_JP.UTF-8", nullptr, "de_AT.UTF-8", {"ja-JP"}},
+        {"es_ES.UTF-8@euro", "ja_JP.UTF-8", nullptr, "de_AT.UTF-8", {"es-ES"}},
+        {"C", "ja_JP.UTF-8", "de", "de_AT.UTF-8", {}}, // LANGUAGE means nothing in C
+        {"POSIX", "ja_JP.UTF-8", "de", "de_AT.UTF-8", {}},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(c.expected.join(',').toStdString());
+        for (auto [name, value] : {std::pair{"LC_ALL", c.all},
+                                   {"LC_MESSAGES", c.messages},
+                                   {"LANGUAGE", c.language},
+                                   {"LANG", c.lang}})
+            value ? env.set(name, value) : env.unset(name);
+        EXPECT_EQ(preferredLanguages(), c.expected);
+    }
 }
 
 TEST(Bundle, LooksUpTablesInPreferredLocalizationsThenEnglish) {
     QTemporaryDir dir;
-    auto write = [&](const QString& rel, const QByteArray& text) {
-        QDir().mkpath(QFileInfo(dir.filePath(rel)).absolutePath());
-        QFile f(dir.filePath(rel));
-        ASSERT_TRUE(f.open(QIODevice::WriteOnly));
-        f.write(text);
-    };
-    write("B.bundle/en.lproj/Localizable.strings", "\"A\" = \"en A\"; \"B\" = \"en B\";");
-    write("B.bundle/de.lproj/Localizable.strings", "\"A\" = \"de A\";");
-    write("B.bundle/pt-BR.lproj/Localizable.strings", "\"A\" = \"pt-BR A\";");
-    write("B.bundle/de.lproj/Other.strings", "\"A\" = \"de other A\";");
-    write("B.bundle/de.lproj/Broken.strings", "\"A\" = ");
+    write(dir.filePath("B.bundle/en.lproj/Localizable.strings"), R"("A" = "en A"; "B" = "en B";)");
+    write(dir.filePath("B.bundle/de.lproj/Localizable.strings"), R"("A" = "de A";)");
+    write(dir.filePath("B.bundle/pt-BR.lproj/Localizable.strings"), R"("A" = "pt-BR A";)");
+    write(dir.filePath("B.bundle/de.lproj/Other.strings"), R"("A" = "de other A";)");
+    write(dir.filePath("B.bundle/de.lproj/Broken.strings"), R"("A" = )");
     auto bundle = Bundle::bundleWithPath(dir.filePath("B.bundle"));
     ASSERT_TRUE(bundle);
     EXPECT_EQ(bundle, Bundle::bundleWithPath(dir.filePath("B.bundle")));
     EXPECT_FALSE(Bundle::bundleWithPath(dir.filePath("missing.bundle")));
 
-    ScopedEnv env;
+    ScopedEnv env("LANG", "de_CH.UTF-8");
     env.unset("LC_ALL");
     env.unset("LC_MESSAGES");
-    env.set("LANG", "de_CH.UTF-8");
     env.set("LANGUAGE", "de_CH:pt_BR");
     EXPECT_EQ(bundle->preferredLocalizations(), (QStringList{"de", "pt-BR", "en"}));
     EXPECT_EQ(bundle->localizedStringForKey("A", "", ""), "de A");
@@ -117,8 +111,6 @@ TEST(DesktopEntry, ReadsTheMainGroupWithLocalizedKeysAndEscapes) {
     EXPECT_EQ(entry->value("Name"), "Racer Deluxe");
     EXPECT_EQ(entry->value("Comment"), "a\nb");
     const auto names = entry->localizedValues("Name");
-    EXPECT_EQ(names.value("de-AT"), "Rennwagen");
-    EXPECT_EQ(names.value("ja"), "レーサー");
-    EXPECT_EQ(names.size(), 2);
+    EXPECT_EQ(names, (QHash<QString, QString>{{"de-AT", "Rennwagen"}, {"ja", "レーサー"}}));
     EXPECT_FALSE(DesktopEntry::parse("Name=No group\n"));
 }
