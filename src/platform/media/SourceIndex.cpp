@@ -103,8 +103,11 @@ SourceIndex SourceIndex::scan(AVFormatContext* input, const QString& hostPath) {
                 const auto [pos, dts] = seen->second.posAndDts.front();
                 for (const FragmentSample& s : from->samples)
                     if (s.pos == pos) {
-                        shift = dts - StreamTime::rescale(s.dts, AVRational{1, from->timescale},
-                                                          stream->time_base);
+                        const std::int64_t own = StreamTime::rescale(
+                            s.dts, AVRational{1, from->timescale}, stream->time_base);
+                        if (dts == AV_NOPTS_VALUE || own == AV_NOPTS_VALUE ||
+                            __builtin_sub_overflow(dts, own, &shift))
+                            shift = 0;
                         break;
                     }
             }
@@ -114,9 +117,17 @@ SourceIndex SourceIndex::scan(AVFormatContext* input, const QString& hostPath) {
             for (const FragmentSample& s : from->samples) {
                 const AVRational scale{1, from->timescale};
                 IndexedSample sample;
-                sample.dts = StreamTime::rescale(s.dts, scale, stream->time_base) + shift;
-                sample.pts = StreamTime::rescale(s.pts, scale, stream->time_base) + shift;
+                // A damaged fragment can give times that no stream time holds;
+                // such a sample cannot be placed, so it is left out.
+                const std::int64_t dts = StreamTime::rescale(s.dts, scale, stream->time_base);
+                const std::int64_t pts = StreamTime::rescale(s.pts, scale, stream->time_base);
                 sample.duration = StreamTime::rescale(s.duration, scale, stream->time_base);
+                if (dts == AV_NOPTS_VALUE || pts == AV_NOPTS_VALUE ||
+                    sample.duration == AV_NOPTS_VALUE ||
+                    __builtin_add_overflow(dts, shift, &sample.dts) ||
+                    __builtin_add_overflow(pts, shift, &sample.pts) ||
+                    sample.pts > INT64_MAX - std::max<std::int64_t>(sample.duration, 0))
+                    continue;
                 sample.pos = s.pos;
                 sample.size = s.size;
                 sample.key = !video || s.key;
