@@ -166,8 +166,8 @@ ErrorPtr ClipWriter::seek() {
 ErrorPtr ClipWriter::copyRange() {
     AVFormatContext* in = input_.get();
     const std::int64_t progressFrom = StreamTime::fromMediaTime(rangeStart_, AV_TIME_BASE_Q);
-    const std::int64_t progressSpan = std::max<std::int64_t>(
-        1, StreamTime::fromMediaTime(rangeEnd_, AV_TIME_BASE_Q) - progressFrom);
+    const double progressSpan = std::max(
+        1.0, double(StreamTime::fromMediaTime(rangeEnd_, AV_TIME_BASE_Q)) - double(progressFrom));
     ffmpeg::PacketPtr packet = ffmpeg::makePacket();
     while (!allDone()) {
         if (job_.isCancelled())
@@ -188,11 +188,13 @@ ErrorPtr ClipWriter::copyRange() {
             av_packet_unref(packet.get());
             continue;
         }
-        if (s == lead_ && job_.progress && packet->dts != AV_NOPTS_VALUE)
-            job_.progress(
-                float(StreamTime::rescale(packet->dts, in->streams[s]->time_base, AV_TIME_BASE_Q) -
-                      progressFrom) /
-                float(progressSpan));
+        if (s == lead_ && job_.progress && packet->dts != AV_NOPTS_VALUE) {
+            // In floating point: a damaged file's times may be anywhere.
+            const std::int64_t at =
+                StreamTime::rescale(packet->dts, in->streams[s]->time_base, AV_TIME_BASE_Q);
+            if (at != AV_NOPTS_VALUE)
+                job_.progress(float((double(at) - double(progressFrom)) / progressSpan));
+        }
         bool dispatchNow = settled_;
         if (!settled_)
             if (ErrorPtr e = takeBeforeStart(packet, &dispatchNow))
