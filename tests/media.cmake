@@ -27,7 +27,6 @@ target_link_libraries(tamsel-test-export PRIVATE tamsel_platform_media tamsel_wa
 
 tamsel_add_tests(tamsel_media_integration_tests integration
   SOURCES
-    media/FragmentIndexTest.cpp
     media/GeneratedMovieTest.cpp
     media/ImageGeneratorTest.cpp
     media/MediaOpeningTest.cpp

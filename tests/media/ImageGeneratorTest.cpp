@@ -1,5 +1,6 @@
-// The image generator's tolerances, scaling, cancellation and failures; its
-// strip on every kind of recording is checked in RecordingKindsTest.
+// The image generator's tolerances, scaling and cancellation; its strip on
+// every kind of recording is checked in RecordingKindsTest, its failures in
+// MediaOpeningTest.
 
 #include "platform/media/ImageGenerator.h"
 #include "MediaFixtures.h"
@@ -127,25 +128,4 @@ TEST(ImageGenerator, CancelCompletesWhatIsPendingAsCancelledAndLaterRequestsAreS
     const auto after = generate(*generator, {1.0});
     ASSERT_EQ(after.size(), 1u);
     EXPECT_EQ(after[0].result, ImageGeneratorResult::Succeeded);
-}
-
-TEST(ImageGenerator, FailsWithAnErrorWhenNoFrameCanBeDecoded) {
-    for (const QString& path :
-         {movieFor({.truncated = true}), QStringLiteral("/no/such/file.mp4")}) {
-        auto generator =
-            ImageGenerator::imageGeneratorWithAsset(Asset::assetWithURL(QUrl::fromLocalFile(path)));
-        const auto done = generate(*generator, {0.0, 1.0});
-        ASSERT_EQ(done.size(), 2u);
-        for (const Completion& c : done) {
-            EXPECT_EQ(c.result, ImageGeneratorResult::Failed);
-            EXPECT_TRUE(c.image.isNull());
-            ASSERT_TRUE(c.error);
-            EXPECT_NE(c.error->code(), 0);
-        }
-        MediaTime actual;
-        ErrorPtr error;
-        EXPECT_TRUE(generator->copyImageAtTime_actualTime_error(MediaTime::zero(), &actual, &error)
-                        .isNull());
-        EXPECT_TRUE(error);
-    }
 }

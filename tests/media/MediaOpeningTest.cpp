@@ -78,20 +78,32 @@ TEST(MediaOpening, WhatIsNotAMovieGivesNoTracksAndItsReasonWithoutWaiting) {
         EXPECT_FALSE(asset->duration().isValid());
         EXPECT_EQ(asset->url(), url);
 
-        // Its thumbnails and exports fail, without waiting either.
-        std::promise<ImageGeneratorResult> imaged;
-        ImageGenerator::imageGeneratorWithAsset(asset)
-            ->generateImagesAsynchronouslyForTimes_completionHandler(
-                {MediaTime::zero()}, [&](MediaTime, QImage, MediaTime, ImageGeneratorResult result,
-                                         ErrorPtr) { imaged.set_value(result); });
+        // Its thumbnails, either way, and its exports fail with their
+        // errors, without waiting either.
+        auto generator = ImageGenerator::imageGeneratorWithAsset(asset);
+        std::promise<bool> imaged;
+        generator->generateImagesAsynchronouslyForTimes_completionHandler(
+            {MediaTime::zero()},
+            [&](MediaTime, QImage image, MediaTime, ImageGeneratorResult result, ErrorPtr error) {
+                imaged.set_value(result == ImageGeneratorResult::Failed && image.isNull() &&
+                                 error && error->code() != 0);
+            });
         auto image = imaged.get_future();
         ASSERT_EQ(image.wait_for(std::chrono::seconds(30)), std::future_status::ready);
-        EXPECT_EQ(image.get(), ImageGeneratorResult::Failed);
+        EXPECT_TRUE(image.get());
+        MediaTime actual;
+        ErrorPtr error;
+        EXPECT_TRUE(generator->copyImageAtTime_actualTime_error(MediaTime::zero(), &actual, &error)
+                        .isNull());
+        EXPECT_TRUE(error);
         const QString output = dir.filePath("clip.mp4");
         mediatest::ExportRun run{mediatest::makeSession(asset, output, 0, 1)};
         ASSERT_TRUE(run.runAndWait(30000));
+        EXPECT_EQ(run.completions, 1);
         EXPECT_EQ(run.session->status(), int(ExportSessionStatus::Failed));
+        EXPECT_NE(run.session->error() ? run.session->error()->code() : 0, 0);
         EXPECT_FALSE(QFile::exists(output));
+        EXPECT_FALSE(mediatest::leftovers(output));
     }
     ::close(writer);
 }
