@@ -58,7 +58,7 @@ class EditorKeyboardTest : public EditorOnFakes {
 
 } // namespace
 
-TEST_F(EditorKeyboardTest, SpacePlaysFromTheOverlayThenPausesWithTheChromeBack) {
+TEST_F(EditorKeyboardTest, SpacePlaysAndPausesAndAFocusedButtonKeepsTheKeys) {
     ASSERT_TRUE(show());
     ASSERT_TRUE(editor->isIntroMode());
     ASSERT_FALSE(topBarHolds(editor->playButton)) << "in intro only the overlay plays";
@@ -69,40 +69,27 @@ TEST_F(EditorKeyboardTest, SpacePlaysFromTheOverlayThenPausesWithTheChromeBack) 
     EXPECT_TRUE(editor->isUIHidden()) << "playing hides the chrome";
     ASSERT_TRUE(waitUntil([&] { return playing(); }));
     EXPECT_TRUE(topBarHolds(editor->pauseButton));
-
     // The pause button is faded out: the chrome comes back as a tap on the
     // video brings it, then the button is pressed.
     type(Qt::Key_Space);
     EXPECT_FALSE(playing());
     EXPECT_FALSE(editor->isUIHidden());
-    EXPECT_TRUE(topBarHolds(editor->playButton));
+    ASSERT_TRUE(topBarHolds(editor->playButton));
 
+    const auto widget = [&](const std::shared_ptr<ToolbarItem>& item) {
+        return editor->topToolBar->widgetForItem(item.get());
+    };
+    widget(editor->playButton)->setFocus(Qt::TabFocusReason);
     type(Qt::Key_Space);
     EXPECT_TRUE(waitUntil([&] { return playing(); }));
     EXPECT_TRUE(editor->isUIHidden());
-}
-
-TEST_F(EditorKeyboardTest, AFocusedButtonKeepsTheKeysAndTheFocusFollowsPlayAndPause) {
-    ASSERT_TRUE(show());
-    type(Qt::Key_Space);
-    ASSERT_TRUE(waitUntil([&] { return playing(); }));
-    type(Qt::Key_Space);
-    ASSERT_TRUE(topBarHolds(editor->playButton));
-    QWidget* play = editor->topToolBar->widgetForItem(editor->playButton.get());
-    play->setFocus(Qt::TabFocusReason);
-
-    type(Qt::Key_Space);
-    EXPECT_TRUE(waitUntil([&] { return playing(); }));
-    EXPECT_EQ(window->focusWidget(), editor->topToolBar->widgetForItem(editor->pauseButton.get()))
-        << "play became pause where it stood";
-    ASSERT_TRUE(editor->isUIHidden());
+    EXPECT_EQ(window->focusWidget(), widget(editor->pauseButton)) << "play became pause in place";
     // The focused pause button has faded out with the chrome: its key shows
     // the chrome again and presses it.
     type(Qt::Key_Space);
     EXPECT_FALSE(playing());
     EXPECT_FALSE(editor->isUIHidden());
-    EXPECT_EQ(window->focusWidget(), editor->topToolBar->widgetForItem(editor->playButton.get()));
-
+    EXPECT_EQ(window->focusWidget(), widget(editor->playButton));
     // A focused toolbar button leaves the arrows to the movie.
     const double before = playhead();
     type(Qt::Key_Right);

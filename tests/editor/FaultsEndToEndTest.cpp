@@ -9,7 +9,6 @@
 #include "platform/media/Asset.h"
 #include "support/ProcessProbe.h"
 
-#include <QCoreApplication>
 #include <QDir>
 #include <QFile>
 #include <QProcess>
@@ -24,9 +23,9 @@ using testing_support::processEnded;
 
 namespace {
 
-QProcessEnvironment environmentWith(const QString& name, const QString& value) {
+QProcessEnvironment loggingToStderr() {
     QProcessEnvironment environment;
-    environment.insert(name, value);
+    environment.insert("TAMSEL_LOG_STDERR", "1");
     return environment;
 }
 
@@ -57,24 +56,6 @@ class Faults : public EndToEnd {
   protected:
     QString store() const { return mobile.filePath("Library/Tamsel"); }
 
-    // Starts tamsel-edit on its own, for tests that kill one side.
-    void startHost(QProcess& host, const QString& movie, const QString& script) {
-        const QString scriptPath = mobile.filePath("script.txt");
-        QFile file(scriptPath);
-        ASSERT_TRUE(file.open(QIODevice::WriteOnly));
-        file.write(script.toUtf8());
-        file.close();
-        QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
-        environment.insert("TAMSEL_MOBILE_ROOT", mobile.path());
-        environment.insert("TAMSEL_ALBUM_DIR", album.path());
-        environment.insert("TAMSEL_AUDIO", "null");
-        environment.insert("QT_QPA_PLATFORM", "offscreen");
-        host.setProcessEnvironment(environment);
-        host.start(QCoreApplication::applicationDirPath() + "/tamsel-edit",
-                   {movie, "--automation", scriptPath});
-        ASSERT_TRUE(host.waitForStarted());
-    }
-
     // Either nothing in the album, or whole clips only: each one opens and
     // lasts about `seconds`; nothing hidden, no temporary name.
     void expectWholeClipsOnly(double seconds) {
@@ -101,7 +82,7 @@ TEST_F(Faults, ADiskThatFillsUpMidExportLeavesNothingBehind) {
     // user closes the window.
     const Run run = edit("wait ready\ndrag end 9\ntap trimButton\nwait log \"Export Trim Video\" "
                          "60\ndismiss\n",
-                         {}, {}, environmentWith("TAMSEL_LOG_STDERR", "1"));
+                         {}, {}, loggingToStderr());
     ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
     EXPECT_TRUE(run.err.contains("TQVideoEditorViewController: Export Trim Video Failed, due to "
                                  "error: "))
@@ -117,12 +98,8 @@ TEST_F(Faults, AnAlbumThatCannotBeWrittenLosesNothing) {
     QFile blocker(mobile.filePath("not-a-folder"));
     ASSERT_TRUE(blocker.open(QIODevice::WriteOnly));
     blocker.close();
-    const QProcessEnvironment env = [&] {
-        QProcessEnvironment e;
-        e.insert("TAMSEL_ALBUM_DIR", blocker.fileName() + "/Screen Recordings");
-        e.insert("TAMSEL_LOG_STDERR", "1");
-        return e;
-    }();
+    QProcessEnvironment env = loggingToStderr();
+    env.insert("TAMSEL_ALBUM_DIR", blocker.fileName() + "/Screen Recordings");
     const QByteArray original = hashOf(recording());
 
     const Run trimmed = edit("wait ready\ndrag end 4\ntap trimButton\nwait exporting=false "
@@ -143,16 +120,13 @@ TEST_F(Faults, AnAlbumThatCannotBeWrittenLosesNothing) {
 
 TEST_F(Faults, AHostKilledDuringAnExportLeavesNoPartialClip) {
     const QString movie = mobile.filePath("long.mp4");
-    testmedia::MovieSpec movieSpec;
-    movieSpec.seconds = 20;
-    movieSpec.width = 640;
-    movieSpec.height = 360;
-    movieSpec.bFrames = 2; // reordered frames: the export goes through the remuxer
-    ASSERT_TRUE(testmedia::writeMovie(movie, movieSpec));
+    // Reordered frames: the export goes through the remuxer.
+    ASSERT_TRUE(
+        testmedia::writeMovie(movie, {.width = 640, .height = 360, .seconds = 20, .bFrames = 2}));
     const QByteArray original = hashOf(movie);
 
     QProcess host;
-    startHost(host, movie, "wait ready\ndrag end 19\ntap trimButton\nsleep 60\n");
+    start(host, "wait ready\ndrag end 19\ntap trimButton\nsleep 60\n", movie);
     qint64 extension = 0;
     ASSERT_TRUE(pollUntil([&] { return (extension = childOf(host.processId())) != 0; }, 20000));
     // The moment the export's first file shows in the store, the host dies.
@@ -171,7 +145,7 @@ TEST_F(Faults, AnExtensionKilledDuringAnAlbumWriteLeavesNoPartialClip) {
     const QString movie = mobile.filePath("large.mp4");
     ASSERT_TRUE(writeLargeRecording(movie, recording(), 160 << 20));
     QProcess host;
-    startHost(host, movie, "wait ready\ntap saveButton\nsleep 60\n");
+    start(host, "wait ready\ntap saveButton\nsleep 60\n", movie);
     qint64 extension = 0;
     ASSERT_TRUE(pollUntil([&] { return (extension = childOf(host.processId())) != 0; }, 20000));
     // The untrimmed save tells the host first, then writes to the album.
@@ -202,7 +176,9 @@ TEST_F(Faults, ALargeUntrimmedSaveAcrossFileSystemsArrivesWhole) {
     ASSERT_TRUE(writeLargeRecording(movie, recording(), size));
     const Run run = edit("wait ready\ntap saveButton\n", movie);
     ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
-    ASSERT_EQ(albumFiles(), QStringList{"large.mp4"});
+    EXPECT_EQ(run.hostReport, kSavedToAlbumReport);
+    ASSERT_EQ(albumFiles(), QStringList{"large.mp4"})
+        << "the album write finishes before the process ends";
     EXPECT_EQ(hashOf(album.filePath("large.mp4")), hashOf(movie));
 }
 

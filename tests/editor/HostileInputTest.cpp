@@ -103,13 +103,24 @@ tap doneButton)"),
     EXPECT_TRUE(filesUnder(store()).isEmpty());
 }
 
-TEST_F(HostileInput, APipeAsTheMovieGetsAnEditorThatStillEnds) {
-    // Handed a named pipe, the editor once opened it on the main thread and
-    // waited for good, window and host with it.
+// Handed a named pipe, the editor once opened it on the main thread and
+// waited for good, window and host with it; a file that is not a movie at
+// all still gets an editor, in intro mode, that ends when cancelled.
+TEST_F(HostileInput, APipeOrAFileThatIsNotAMovieGetsAnEditorThatStillEnds) {
     const QString fifo = mobile.filePath("recording.mp4");
     ASSERT_EQ(::mkfifo(QFile::encodeName(fifo).constData(), 0600), 0);
-    const Run run = edit("wait log \"not a regular file\" 20\ntap cancelButton\n", fifo);
-    ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
-    EXPECT_EQ(run.hostReport, "[]");
-    EXPECT_TRUE(albumFiles().isEmpty());
+    QFile text(mobile.filePath("notes.mp4"));
+    ASSERT_TRUE(text.open(QIODevice::WriteOnly));
+    text.write("plain text, not a movie");
+    text.close();
+    for (const auto& [movie, line] : {std::pair{fifo, "not a regular file"},
+                                      std::pair{text.fileName(), "loaded input items"}}) {
+        const Run run = edit(
+            QString("wait log \"%1\" 20\nsleep 0.5\ndump\ntap cancelButton\n").arg(line), movie);
+        ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
+        ASSERT_EQ(run.dumps.size(), 1);
+        EXPECT_TRUE(run.dumps[0]["introMode"].toBool());
+        EXPECT_EQ(run.hostReport, "[]");
+        EXPECT_TRUE(albumFiles().isEmpty());
+    }
 }
