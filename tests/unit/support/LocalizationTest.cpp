@@ -44,31 +44,28 @@ void writeText(const QString& path, const QByteArray& text) {
 
 } // namespace
 
-TEST(FrameworkStrings, ARegionFallsBackToItsPlainLanguage) {
+// A region falls back to its plain language; without languages or a match
+// the framework's own lookup decides, which walks the rest of the list
+// after the first preferred language, tried by name.
+TEST(FrameworkStrings, AreLookedUpInTheUsersLanguage) {
+    const struct {
+        const char *lang, *language, *key, *expected;
+    } cases[] = {
+        {"de_AT.UTF-8", nullptr, "DONE", "Fertig"},
+        {"C", nullptr, "SAVE", "Save"},
+        {"C", nullptr, "NO_SUCH_KEY", "NO_SUCH_KEY"},
+        {"it_IT.UTF-8", "it:ja", "CANCEL", "キャンセル"},
+        {"de_DE.UTF-8", nullptr, "NO_SUCH_KEY", "NO_SUCH_KEY"},
+    };
+    for (const auto& c : cases) {
+        Languages env(c.lang, c.language);
+        EXPECT_EQ(localized(c.key), QString::fromUtf8(c.expected)) << c.lang << " " << c.key;
+    }
     Languages env("de_AT.UTF-8");
-    EXPECT_EQ(localized("DONE"), QStringLiteral("Fertig"));
     EXPECT_EQ(BundleTXExtensions::_txLocalizedStringFromFrameworkBundleWithKey_bundleID(
                   "DONE", "any.other.id"),
               QStringLiteral("Fertig"))
         << "the bundle identifier does not change the text";
-}
-
-TEST(FrameworkStrings, WithoutLanguagesOrAMatchTheFrameworksOwnLookupDecides) {
-    {
-        Languages env("C");
-        EXPECT_EQ(localized("SAVE"), QStringLiteral("Save"));
-        EXPECT_EQ(localized("NO_SUCH_KEY"), QStringLiteral("NO_SUCH_KEY"));
-    }
-    {
-        // Only the first preferred language is tried by name; the framework's
-        // own lookup then walks the rest of the list.
-        Languages env("it_IT.UTF-8", "it:ja");
-        EXPECT_EQ(localized("CANCEL"), QStringLiteral("キャンセル"));
-    }
-    {
-        Languages env("de_DE.UTF-8");
-        EXPECT_EQ(localized("NO_SUCH_KEY"), QStringLiteral("NO_SUCH_KEY"));
-    }
 }
 
 TEST(FrameworkStrings, EveryShippedLanguageHasEveryKey) {
@@ -118,20 +115,13 @@ TEST(AppNames, DisplayNameComesFromTheInstalledDesktopEntryInTheUsersLanguage) {
     writeText(dirs.path() + "/applications/org.example.Nameless.desktop",
               "[Desktop Entry]\nType=Application\n");
 
-    {
-        Languages lang("de_AT.UTF-8");
+    for (const auto& [lang, name] :
+         {std::pair{"de_AT.UTF-8", "Rennwagen"}, std::pair{"fr_CA.UTF-8", "Bolide"},
+          std::pair{"es_ES.UTF-8", "Racer"}}) {
+        Languages env(lang);
         EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"),
-                  QStringLiteral("Rennwagen"));
-    }
-    {
-        Languages lang("fr_CA.UTF-8");
-        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"),
-                  QStringLiteral("Bolide"));
-    }
-    {
-        Languages lang("es_ES.UTF-8");
-        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"),
-                  QStringLiteral("Racer"));
+                  QString(name))
+            << lang;
     }
     const auto nameless =
         BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Nameless");
