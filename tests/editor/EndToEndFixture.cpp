@@ -1,9 +1,11 @@
 #include "EndToEndFixture.h"
 
 #include "MediaGenerator.h"
+#include "platform/media/Asset.h"
 
 #include <QCoreApplication>
 #include <QDir>
+#include <QDirIterator>
 #include <QFile>
 #include <QJsonDocument>
 #include <QProcess>
@@ -106,6 +108,20 @@ QStringList EndToEnd::albumFiles() const {
 }
 
 QStringList EndToEnd::tempFiles() const {
-    return QDir(mobile.filePath("Library/Tamsel"))
-        .entryList(QDir::Files | QDir::Hidden | QDir::NoDotAndDotDot);
+    QStringList out;
+    QDirIterator it(mobile.filePath("Library/Tamsel"),
+                    QDir::AllEntries | QDir::Hidden | QDir::System | QDir::NoDotAndDotDot,
+                    QDirIterator::Subdirectories);
+    while (it.hasNext())
+        out.append(it.next());
+    return out;
+}
+
+void EndToEnd::expectWholeClipsOnly(double seconds) const {
+    for (const QString& name : albumFiles()) {
+        EXPECT_FALSE(name.startsWith('.')) << "a partial import: " << name.toStdString();
+        const auto clip = platform::Asset::assetWithURL(QUrl::fromLocalFile(album.filePath(name)));
+        EXPECT_TRUE(clip->isPlayable()) << name.toStdString();
+        EXPECT_NEAR(clip->duration().seconds(), seconds, 0.2) << name.toStdString();
+    }
 }

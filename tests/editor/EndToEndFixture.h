@@ -46,7 +46,11 @@ class EndToEnd : public ::testing::Test {
                const QStringList& extra = {}, const QProcessEnvironment& env = {});
 
     QStringList albumFiles() const;
+    // Everything in the temporary store, in its folders too, hidden or not.
     QStringList tempFiles() const;
+    // Either nothing in the album, or whole clips only: each one opens and
+    // lasts about `seconds`; nothing hidden, no temporary name.
+    void expectWholeClipsOnly(double seconds) const;
     static QString recording() { return dir->filePath("recording.mp4"); }
 
     static QTemporaryDir* dir;
