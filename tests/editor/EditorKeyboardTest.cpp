@@ -17,16 +17,16 @@ namespace {
 
 class EditorKeyboardTest : public EditorOnFakes {
   protected:
-    // The editor in a window of its own with the keyboard installed.
-    bool show() {
+    // The editor in a window of its own with the keyboard installed (which
+    // belongs to the window).
+    void SetUp() override {
+        EditorOnFakes::SetUp();
         makeEditor();
         window = std::make_unique<Window>();
         window->resize(960, 600);
         window->setRootViewController(editor);
         window->show();
-        keyboard = new EditorKeyboard(window.get(), [this] { return editor.get(); });
-        keyboard->editorDidAppear();
-        return true;
+        (new EditorKeyboard(window.get(), [this] { return editor.get(); }))->editorDidAppear();
     }
 
     void TearDown() override {
@@ -53,13 +53,11 @@ class EditorKeyboardTest : public EditorOnFakes {
     double playhead() { return editor->avTrimmer->value(); }
 
     std::unique_ptr<Window> window;
-    EditorKeyboard* keyboard = nullptr; // belongs to the window
 };
 
 } // namespace
 
 TEST_F(EditorKeyboardTest, SpacePlaysAndPausesAndAFocusedButtonKeepsTheKeys) {
-    ASSERT_TRUE(show());
     ASSERT_TRUE(editor->isIntroMode());
     ASSERT_FALSE(topBarHolds(editor->playButton)) << "in intro only the overlay plays";
 
@@ -97,7 +95,6 @@ TEST_F(EditorKeyboardTest, SpacePlaysAndPausesAndAFocusedButtonKeepsTheKeys) {
 }
 
 TEST_F(EditorKeyboardTest, ArrowsStepFramesAndSecondsAndIAndOTrimAtThePlayhead) {
-    ASSERT_TRUE(show());
     const double frame = 1.0 / 30.0;
     type(Qt::Key_Right);
     type(Qt::Key_Right);
@@ -138,7 +135,6 @@ TEST_F(EditorKeyboardTest, ArrowsStepFramesAndSecondsAndIAndOTrimAtThePlayhead) 
 }
 
 TEST_F(EditorKeyboardTest, CtrlSSavesAsTheSaveAndTrimButtonsDo) {
-    ASSERT_TRUE(show());
     type(Qt::Key_S, Qt::ControlModifier);
     EXPECT_TRUE(waitUntil([&] { return editor->activityTypes.contains(SaveToAlbumActivityType); }));
 
@@ -153,7 +149,6 @@ TEST_F(EditorKeyboardTest, CtrlSSavesAsTheSaveAndTrimButtonsDo) {
 }
 
 TEST_F(EditorKeyboardTest, KeysWaitWhileASheetCoversTheEditor) {
-    ASSERT_TRUE(show());
     auto sheet = std::make_shared<ViewController>();
     editor->presentViewController_animated_completion(sheet, false);
     ASSERT_TRUE(waitUntil([&] { return editor->presentedViewController() != nullptr; }));
@@ -169,7 +164,6 @@ TEST_F(EditorKeyboardTest, KeysWaitWhileASheetCoversTheEditor) {
 }
 
 TEST_F(EditorKeyboardTest, EachControlNamesItsKey) {
-    ASSERT_TRUE(show());
     type(Qt::Key_I); // edit mode: the bar with the most keyed items
     const auto button = [&](const std::shared_ptr<ToolbarItem>& item) {
         return editor->topToolBar->widgetForItem(item.get());
