@@ -27,9 +27,9 @@ target_link_libraries(tamsel-test-export PRIVATE tamsel_platform_media tamsel_wa
 
 tamsel_add_tests(tamsel_media_integration_tests integration
   SOURCES
-    media/FragmentIndexTest.cpp
     media/GeneratedMovieTest.cpp
     media/ImageGeneratorTest.cpp
+    media/MediaOpeningTest.cpp
     media/ExportSessionTest.cpp
     media/RecordingKindsTest.cpp
     media/UploadPresetTest.cpp
@@ -39,6 +39,3 @@ target_include_directories(tamsel_media_integration_tests PRIVATE ${PROJECT_SOUR
 target_compile_definitions(tamsel_media_integration_tests PRIVATE
   TAMSEL_TEST_EXPORT_TOOL="$<TARGET_FILE:tamsel-test-export>")
 
-tamsel_add_tests(tamsel_media_opening_tests integration
-  SOURCES media/MediaOpeningTest.cpp
-  LIBS tamsel_platform_media)

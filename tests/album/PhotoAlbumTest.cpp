@@ -8,7 +8,6 @@
 #include "support/TempDir.h"
 #include "support/Wait.h"
 
-#include <QCryptographicHash>
 #include <QDir>
 #include <QFile>
 #include <QTemporaryDir>
@@ -21,16 +20,10 @@
 #include <sys/stat.h>
 
 using namespace platform;
+using testing_support::hashOf;
 using testing_support::waitUntil;
 
 namespace {
-
-QByteArray hashOf(const QString& path) {
-    QFile file(path);
-    if (!file.open(QIODevice::ReadOnly))
-        return {};
-    return QCryptographicHash::hash(file.readAll(), QCryptographicHash::Sha256);
-}
 
 QStringList entries(const QString& folder) {
     QStringList names = QDir(folder).entryList(QDir::Files | QDir::Hidden | QDir::NoDotAndDotDot);
@@ -38,14 +31,18 @@ QStringList entries(const QString& folder) {
     return names;
 }
 
+struct stat statOf(const QString& path) {
+    struct stat info {};
+    EXPECT_EQ(::stat(QFile::encodeName(path).constData(), &info), 0) << path.toStdString();
+    return info;
+}
+
 class PhotoAlbumTest : public ::testing::Test {
   protected:
     static void SetUpTestSuite() {
         source = new QTemporaryDir;
-        testmedia::MovieSpec movieSpec;
-        movieSpec.seconds = 1;
         QString error;
-        ASSERT_TRUE(testmedia::writeMovie(source->filePath("clip.mp4"), movieSpec, &error))
+        ASSERT_TRUE(testmedia::writeMovie(source->filePath("clip.mp4"), {.seconds = 1}, &error))
             << error.toStdString();
     }
     static void TearDownTestSuite() { delete source; }
@@ -89,61 +86,50 @@ TEST_F(PhotoAlbumTest, CopiesAVideoInUnderAUniqueNameAndNeverOverwrites) {
     EXPECT_EQ(hashOf(movie()), original) << "the source is never touched";
 }
 
+// What is not a playable video, or not a regular file (a pipe, a device, a
+// folder: refused without waiting on it), does not come in.
 TEST_F(PhotoAlbumTest, RefusesWhatIsNotPlayableVideo) {
     QFile text(albumRoot.filePath("notes.mp4"));
     ASSERT_TRUE(text.open(QIODevice::WriteOnly));
     text.write("this is not a movie");
     text.close();
-
-    for (const QString& path : {text.fileName(), albumRoot.filePath("missing.mp4")}) {
+    const QString fifo = albumRoot.filePath("recording.mp4");
+    ASSERT_EQ(::mkfifo(fifo.toLocal8Bit().constData(), 0600), 0);
+    for (const QString& path : {text.fileName(), albumRoot.filePath("missing.mp4"), fifo,
+                                QStringLiteral("/dev/zero"), albumRoot.path()}) {
         ErrorPtr error;
-        EXPECT_TRUE(album.importVideo(path, &error).isEmpty());
+        EXPECT_TRUE(album.importVideo(path, &error).isEmpty()) << path.toStdString();
         ASSERT_TRUE(error) << path.toStdString();
         EXPECT_EQ(error->code(), PhotoAlbum::NotVideo);
     }
     EXPECT_TRUE(entries(folder).isEmpty());
 }
 
-TEST_F(PhotoAlbumTest, AFolderThatCannotBeWrittenFailsCleanly) {
-    QFile blocker(albumRoot.filePath("Videos"));
-    ASSERT_TRUE(blocker.open(QIODevice::WriteOnly)); // a file where the folder should be
-    blocker.close();
-
-    std::atomic<bool> done{false};
-    ErrorPtr seen;
-    album.performChanges_creationRequestForAssetFromVideoAtFileURL(
-        QUrl::fromLocalFile(movie()), [&](bool success, ErrorPtr error) {
-            EXPECT_FALSE(success);
-            seen = error;
-            done = true;
-        });
-    ASSERT_TRUE(waitUntil([&] { return done.load(); }));
-    ASSERT_TRUE(seen);
-    EXPECT_EQ(seen->code(), PhotoAlbum::NotWritable);
-}
-
-TEST_F(PhotoAlbumTest, AFullDiskLeavesNoPartialFile) {
-    // A file-size limit below the movie's size stands in for a full disk.
+// A folder that cannot be written (a file where it should be), or a disk
+// that fills up (a file-size limit below the movie's size stands in), fails
+// with its code and leaves no partial file.
+TEST_F(PhotoAlbumTest, AnUnwritableFolderOrAFullDiskFailsCleanly) {
     rlimit saved{};
     ASSERT_EQ(getrlimit(RLIMIT_FSIZE, &saved), 0);
     rlimit small = saved;
     small.rlim_cur = 4096;
     ASSERT_EQ(setrlimit(RLIMIT_FSIZE, &small), 0);
-    ErrorPtr error;
-    const QString saved_path = album.importVideo(movie(), &error);
+    ErrorPtr full;
+    const QString written = album.importVideo(movie(), &full);
     setrlimit(RLIMIT_FSIZE, &saved);
-
-    EXPECT_TRUE(saved_path.isEmpty());
-    ASSERT_TRUE(error);
-    EXPECT_EQ(error->code(), PhotoAlbum::DiskFull);
+    EXPECT_TRUE(written.isEmpty());
+    ASSERT_TRUE(full);
+    EXPECT_EQ(full->code(), PhotoAlbum::DiskFull);
     EXPECT_TRUE(entries(folder).isEmpty()) << entries(folder).join(", ").toStdString();
-}
 
-TEST_F(PhotoAlbumTest, FireAndForgetSavesFinishBeforeTheQueuesDrain) {
-    album.saveVideoAtPathToAlbum(movie());
-    GlobalQueue::drain();
-    EXPECT_EQ(entries(folder), QStringList{"clip.mp4"});
-    EXPECT_EQ(album.lastSavedPath(), folder + "/clip.mp4");
+    QDir(albumRoot.filePath("Videos")).removeRecursively();
+    QFile blocker(albumRoot.filePath("Videos"));
+    ASSERT_TRUE(blocker.open(QIODevice::WriteOnly));
+    blocker.close();
+    ErrorPtr unwritable;
+    EXPECT_TRUE(album.importVideo(movie(), &unwritable).isEmpty());
+    ASSERT_TRUE(unwritable);
+    EXPECT_EQ(unwritable->code(), PhotoAlbum::NotWritable);
 }
 
 // The editor's clips (files of the device's storage) come in without a copy
@@ -166,16 +152,14 @@ TEST_F(PhotoAlbumTest, TheEditorsClipsComeInWithoutACopyAndHostFilesAreCopied) {
         return ::ioctl(b.handle(), FICLONE, a.handle()) == 0;
     }();
 
-    struct stat clipInfo {};
-    ASSERT_EQ(::stat(QFile::encodeName(clip).constData(), &clipInfo), 0);
+    const struct stat clipInfo = statOf(clip);
     for (const QString& path :
          {QStringLiteral("/private/var/mobile/Library/Tamsel/Racer_1700000000.mp4"), clip}) {
         SCOPED_TRACE(path.toStdString());
         ErrorPtr error;
         const QString saved = album.importVideo(path, &error);
         ASSERT_FALSE(saved.isEmpty()) << error->description().toStdString();
-        struct stat savedInfo {};
-        ASSERT_EQ(::stat(QFile::encodeName(saved).constData(), &savedInfo), 0);
+        const struct stat savedInfo = statOf(saved);
         if (reflinks || clipInfo.st_dev != savedInfo.st_dev)
             EXPECT_NE(savedInfo.st_ino, clipInfo.st_ino);
         else
@@ -190,16 +174,12 @@ TEST_F(PhotoAlbumTest, TheEditorsClipsComeInWithoutACopyAndHostFilesAreCopied) {
     // The host's recording, on the same file system, is copied.
     const QString host = albumRoot.filePath("recording.mp4");
     ASSERT_TRUE(QFile::copy(movie(), host));
-    struct stat hostInfo {};
-    ASSERT_EQ(::stat(QFile::encodeName(host).constData(), &hostInfo), 0);
-    ErrorPtr error;
-    const QString saved = album.importVideo(host, &error);
-    struct stat savedInfo {};
-    ASSERT_EQ(::stat(QFile::encodeName(saved).constData(), &savedInfo), 0);
-    EXPECT_NE(savedInfo.st_ino, hostInfo.st_ino);
+    const struct stat savedInfo = statOf(album.importVideo(host, nullptr));
+    EXPECT_NE(savedInfo.st_ino, statOf(host).st_ino);
     EXPECT_EQ(savedInfo.st_nlink, 1u);
 }
 
+// Fire-and-forget saves finish before the queues drain.
 TEST_F(PhotoAlbumTest, TheSharedAlbumIsOneAlbumInTheFolderOfItsFirstUse) {
     testing_support::ScopedEnv env("TAMSEL_ALBUM_DIR", folder.toLocal8Bit());
     const std::shared_ptr<PhotoAlbum> shared = PhotoAlbum::sharedAlbum();
@@ -233,18 +213,6 @@ TEST_F(PhotoAlbumTest, ARemovalAskedAfterASaveWaitsUntilTheImportHasTheFile) {
     EXPECT_FALSE(QFile::exists(clip));
     EXPECT_EQ(entries(folder), QStringList{"Racer_1.mp4"});
     EXPECT_EQ(hashOf(folder + "/Racer_1.mp4"), hashOf(movie()));
-}
-
-TEST_F(PhotoAlbumTest, APipeOrADeviceIsRefusedWithoutWaitingOnIt) {
-    const QString fifo = albumRoot.filePath("recording.mp4");
-    ASSERT_EQ(::mkfifo(fifo.toLocal8Bit().constData(), 0600), 0);
-    for (const QString& path : {fifo, QStringLiteral("/dev/zero"), albumRoot.path()}) {
-        ErrorPtr error;
-        EXPECT_TRUE(album.importVideo(path, &error).isEmpty()) << path.toStdString();
-        ASSERT_TRUE(error) << path.toStdString();
-        EXPECT_EQ(error->code(), PhotoAlbum::NotVideo);
-    }
-    EXPECT_TRUE(entries(folder).isEmpty());
 }
 
 TEST_F(PhotoAlbumTest, ANameThatStartsWithADotIsNotHiddenInTheAlbum) {

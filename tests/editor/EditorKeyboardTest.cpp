@@ -17,16 +17,16 @@ namespace {
 
 class EditorKeyboardTest : public EditorOnFakes {
   protected:
-    // The editor in a window of its own with the keyboard installed.
-    bool show() {
+    // The editor in a window of its own with the keyboard installed (which
+    // belongs to the window).
+    void SetUp() override {
+        EditorOnFakes::SetUp();
         makeEditor();
         window = std::make_unique<Window>();
         window->resize(960, 600);
         window->setRootViewController(editor);
         window->show();
-        keyboard = new EditorKeyboard(window.get(), [this] { return editor.get(); });
-        keyboard->editorDidAppear();
-        return true;
+        (new EditorKeyboard(window.get(), [this] { return editor.get(); }))->editorDidAppear();
     }
 
     void TearDown() override {
@@ -53,13 +53,11 @@ class EditorKeyboardTest : public EditorOnFakes {
     double playhead() { return editor->avTrimmer->value(); }
 
     std::unique_ptr<Window> window;
-    EditorKeyboard* keyboard = nullptr; // belongs to the window
 };
 
 } // namespace
 
-TEST_F(EditorKeyboardTest, SpacePlaysFromTheOverlayThenPausesWithTheChromeBack) {
-    ASSERT_TRUE(show());
+TEST_F(EditorKeyboardTest, SpacePlaysAndPausesAndAFocusedButtonKeepsTheKeys) {
     ASSERT_TRUE(editor->isIntroMode());
     ASSERT_FALSE(topBarHolds(editor->playButton)) << "in intro only the overlay plays";
 
@@ -69,40 +67,27 @@ TEST_F(EditorKeyboardTest, SpacePlaysFromTheOverlayThenPausesWithTheChromeBack) 
     EXPECT_TRUE(editor->isUIHidden()) << "playing hides the chrome";
     ASSERT_TRUE(waitUntil([&] { return playing(); }));
     EXPECT_TRUE(topBarHolds(editor->pauseButton));
-
     // The pause button is faded out: the chrome comes back as a tap on the
     // video brings it, then the button is pressed.
     type(Qt::Key_Space);
     EXPECT_FALSE(playing());
     EXPECT_FALSE(editor->isUIHidden());
-    EXPECT_TRUE(topBarHolds(editor->playButton));
+    ASSERT_TRUE(topBarHolds(editor->playButton));
 
+    const auto widget = [&](const std::shared_ptr<ToolbarItem>& item) {
+        return editor->topToolBar->widgetForItem(item.get());
+    };
+    widget(editor->playButton)->setFocus(Qt::TabFocusReason);
     type(Qt::Key_Space);
     EXPECT_TRUE(waitUntil([&] { return playing(); }));
     EXPECT_TRUE(editor->isUIHidden());
-}
-
-TEST_F(EditorKeyboardTest, AFocusedButtonKeepsTheKeysAndTheFocusFollowsPlayAndPause) {
-    ASSERT_TRUE(show());
-    type(Qt::Key_Space);
-    ASSERT_TRUE(waitUntil([&] { return playing(); }));
-    type(Qt::Key_Space);
-    ASSERT_TRUE(topBarHolds(editor->playButton));
-    QWidget* play = editor->topToolBar->widgetForItem(editor->playButton.get());
-    play->setFocus(Qt::TabFocusReason);
-
-    type(Qt::Key_Space);
-    EXPECT_TRUE(waitUntil([&] { return playing(); }));
-    EXPECT_EQ(window->focusWidget(), editor->topToolBar->widgetForItem(editor->pauseButton.get()))
-        << "play became pause where it stood";
-    ASSERT_TRUE(editor->isUIHidden());
+    EXPECT_EQ(window->focusWidget(), widget(editor->pauseButton)) << "play became pause in place";
     // The focused pause button has faded out with the chrome: its key shows
     // the chrome again and presses it.
     type(Qt::Key_Space);
     EXPECT_FALSE(playing());
     EXPECT_FALSE(editor->isUIHidden());
-    EXPECT_EQ(window->focusWidget(), editor->topToolBar->widgetForItem(editor->playButton.get()));
-
+    EXPECT_EQ(window->focusWidget(), widget(editor->playButton));
     // A focused toolbar button leaves the arrows to the movie.
     const double before = playhead();
     type(Qt::Key_Right);
@@ -110,7 +95,6 @@ TEST_F(EditorKeyboardTest, AFocusedButtonKeepsTheKeysAndTheFocusFollowsPlayAndPa
 }
 
 TEST_F(EditorKeyboardTest, ArrowsStepFramesAndSecondsAndIAndOTrimAtThePlayhead) {
-    ASSERT_TRUE(show());
     const double frame = 1.0 / 30.0;
     type(Qt::Key_Right);
     type(Qt::Key_Right);
@@ -151,7 +135,6 @@ TEST_F(EditorKeyboardTest, ArrowsStepFramesAndSecondsAndIAndOTrimAtThePlayhead) 
 }
 
 TEST_F(EditorKeyboardTest, CtrlSSavesAsTheSaveAndTrimButtonsDo) {
-    ASSERT_TRUE(show());
     type(Qt::Key_S, Qt::ControlModifier);
     EXPECT_TRUE(waitUntil([&] { return editor->activityTypes.contains(SaveToAlbumActivityType); }));
 
@@ -166,7 +149,6 @@ TEST_F(EditorKeyboardTest, CtrlSSavesAsTheSaveAndTrimButtonsDo) {
 }
 
 TEST_F(EditorKeyboardTest, KeysWaitWhileASheetCoversTheEditor) {
-    ASSERT_TRUE(show());
     auto sheet = std::make_shared<ViewController>();
     editor->presentViewController_animated_completion(sheet, false);
     ASSERT_TRUE(waitUntil([&] { return editor->presentedViewController() != nullptr; }));
@@ -182,7 +164,6 @@ TEST_F(EditorKeyboardTest, KeysWaitWhileASheetCoversTheEditor) {
 }
 
 TEST_F(EditorKeyboardTest, EachControlNamesItsKey) {
-    ASSERT_TRUE(show());
     type(Qt::Key_I); // edit mode: the bar with the most keyed items
     const auto button = [&](const std::shared_ptr<ToolbarItem>& item) {
         return editor->topToolBar->widgetForItem(item.get());

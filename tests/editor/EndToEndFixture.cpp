@@ -1,10 +1,11 @@
 #include "EndToEndFixture.h"
 
 #include "MediaGenerator.h"
+#include "platform/media/Asset.h"
 
 #include <QCoreApplication>
-#include <QCryptographicHash>
 #include <QDir>
+#include <QDirIterator>
 #include <QFile>
 #include <QJsonDocument>
 #include <QProcess>
@@ -24,13 +25,6 @@ void EndToEnd::SetUpTestSuite() {
 void EndToEnd::TearDownTestSuite() {
     delete dir;
     dir = nullptr;
-}
-
-QByteArray EndToEnd::hashOf(const QString& path) {
-    QFile file(path);
-    if (!file.open(QIODevice::ReadOnly))
-        return {};
-    return QCryptographicHash::hash(file.readAll(), QCryptographicHash::Sha256);
 }
 
 namespace {
@@ -60,15 +54,14 @@ EndToEnd::Run EndToEnd::editUnderXvfb(const QString& script, const QSize& screen
     return run;
 }
 
-EndToEnd::Run EndToEnd::edit(const QString& script, const QString& movie, const QStringList& extra,
-                             const QProcessEnvironment& env) {
+void EndToEnd::start(QProcess& host, const QString& script, const QString& movie,
+                     const QStringList& extra, const QProcessEnvironment& env) {
     const QString scriptPath = mobile.filePath("script.txt");
     QFile file(scriptPath);
     if (file.open(QIODevice::WriteOnly))
         file.write(script.toUtf8());
     file.close();
 
-    QProcess process;
     QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
     environment.insert("TAMSEL_MOBILE_ROOT", mobile.path());
     environment.insert("TAMSEL_ALBUM_DIR", album.path());
@@ -79,14 +72,20 @@ EndToEnd::Run EndToEnd::edit(const QString& script, const QString& movie, const 
         environment.insert("QT_QPA_PLATFORM", "offscreen");
     for (const QString& key : env.keys())
         environment.insert(key, env.value(key));
-    process.setProcessEnvironment(environment);
+    host.setProcessEnvironment(environment);
     const QStringList program =
         launchPrefix + (xvfbCommand_.isEmpty() ? command(QString(), QSize()) : xvfbCommand_);
-    process.start(program.first(),
-                  program.mid(1) +
-                      QStringList{movie.isEmpty() ? recording() : movie, "--app-name", "Racer",
-                                  "--bundle-id", "org.example.Racer", "--automation", scriptPath} +
-                      extra);
+    host.start(program.first(),
+               program.mid(1) +
+                   QStringList{movie.isEmpty() ? recording() : movie, "--app-name", "Racer",
+                               "--bundle-id", "org.example.Racer", "--automation", scriptPath} +
+                   extra);
+}
+
+EndToEnd::Run EndToEnd::edit(const QString& script, const QString& movie, const QStringList& extra,
+                             const QProcessEnvironment& env) {
+    QProcess process;
+    start(process, script, movie, extra, env);
     if (!process.waitForFinished(180000))
         process.kill();
     Run run{process.exitCode(),
@@ -109,6 +108,20 @@ QStringList EndToEnd::albumFiles() const {
 }
 
 QStringList EndToEnd::tempFiles() const {
-    return QDir(mobile.filePath("Library/Tamsel"))
-        .entryList(QDir::Files | QDir::Hidden | QDir::NoDotAndDotDot);
+    QStringList out;
+    QDirIterator it(mobile.filePath("Library/Tamsel"),
+                    QDir::AllEntries | QDir::Hidden | QDir::System | QDir::NoDotAndDotDot,
+                    QDirIterator::Subdirectories);
+    while (it.hasNext())
+        out.append(it.next());
+    return out;
+}
+
+void EndToEnd::expectWholeClipsOnly(double seconds) const {
+    for (const QString& name : albumFiles()) {
+        EXPECT_FALSE(name.startsWith('.')) << "a partial import: " << name.toStdString();
+        const auto clip = platform::Asset::assetWithURL(QUrl::fromLocalFile(album.filePath(name)));
+        EXPECT_TRUE(clip->isPlayable()) << name.toStdString();
+        EXPECT_NEAR(clip->duration().seconds(), seconds, 0.2) << name.toStdString();
+    }
 }

@@ -1,13 +1,17 @@
 #pragma once
 
+#include "support/TempDir.h"
+
 #include <QByteArray>
 #include <QJsonObject>
-#include <QProcessEnvironment>
+#include <QProcess>
 #include <QSize>
 #include <QString>
 #include <QStringList>
 #include <QTemporaryDir>
 #include <gtest/gtest.h>
+
+using testing_support::hashOf;
 
 // What the host prints when the user saved to the album and left.
 inline const QByteArray kSavedToAlbumReport = "[\"org.tamsel.activity.SaveToAlbum\"]";
@@ -36,10 +40,18 @@ class EndToEnd : public ::testing::Test {
     Run editUnderXvfb(const QString& script, const QSize& screen, const QStringList& extra = {},
                       const QProcessEnvironment& env = {}, bool* skipped = nullptr);
 
+    // Starts what edit() runs without waiting for it, for tests that kill
+    // one side.
+    void start(QProcess& host, const QString& script, const QString& movie = QString(),
+               const QStringList& extra = {}, const QProcessEnvironment& env = {});
+
     QStringList albumFiles() const;
+    // Everything in the temporary store, in its folders too, hidden or not.
     QStringList tempFiles() const;
+    // Either nothing in the album, or whole clips only: each one opens and
+    // lasts about `seconds`; nothing hidden, no temporary name.
+    void expectWholeClipsOnly(double seconds) const;
     static QString recording() { return dir->filePath("recording.mp4"); }
-    static QByteArray hashOf(const QString& path);
 
     static QTemporaryDir* dir;
     QTemporaryDir mobile;

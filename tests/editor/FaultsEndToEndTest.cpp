@@ -1,20 +1,17 @@
 // Faults on the way: a full disk, an album that cannot be written, a host or
-// an extension killed at the worst moment, the host ending the editor right
-// after a save. Each ends with nothing lost and nothing partial: the
-// recording untouched, no clip left half-written in the album or the
-// temporary store.
+// an extension killed at the worst moment. (The host ending the editor the
+// instant a trimmed save finishes is RepeatedUse's typical use.) Each ends with nothing lost and
+// nothing partial: the recording untouched, no clip left half-written in the album or the temporary
+// store.
 
 #include "EndToEndFixture.h"
 #include "MediaGenerator.h"
-#include "platform/media/Asset.h"
 #include "support/ProcessProbe.h"
 
-#include <QCoreApplication>
 #include <QDir>
 #include <QFile>
 #include <QProcess>
 #include <QStorageInfo>
-#include <QUrl>
 #include <csignal>
 #include <sys/stat.h>
 
@@ -24,9 +21,9 @@ using testing_support::processEnded;
 
 namespace {
 
-QProcessEnvironment environmentWith(const QString& name, const QString& value) {
+QProcessEnvironment loggingToStderr() {
     QProcessEnvironment environment;
-    environment.insert(name, value);
+    environment.insert("TAMSEL_LOG_STDERR", "1");
     return environment;
 }
 
@@ -53,44 +50,7 @@ bool writeLargeRecording(const QString& path, const QString& from, qint64 paddin
 
 } // namespace
 
-class Faults : public EndToEnd {
-  protected:
-    QString store() const { return mobile.filePath("Library/Tamsel"); }
-
-    // Starts tamsel-edit on its own, for tests that kill one side.
-    void startHost(QProcess& host, const QString& movie, const QString& script) {
-        const QString scriptPath = mobile.filePath("script.txt");
-        QFile file(scriptPath);
-        ASSERT_TRUE(file.open(QIODevice::WriteOnly));
-        file.write(script.toUtf8());
-        file.close();
-        QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
-        environment.insert("TAMSEL_MOBILE_ROOT", mobile.path());
-        environment.insert("TAMSEL_ALBUM_DIR", album.path());
-        environment.insert("TAMSEL_AUDIO", "null");
-        environment.insert("QT_QPA_PLATFORM", "offscreen");
-        host.setProcessEnvironment(environment);
-        host.start(QCoreApplication::applicationDirPath() + "/tamsel-edit",
-                   {movie, "--automation", scriptPath});
-        ASSERT_TRUE(host.waitForStarted());
-    }
-
-    // Either nothing in the album, or whole clips only: each one opens and
-    // lasts about `seconds`; nothing hidden, no temporary name.
-    void expectWholeClipsOnly(double seconds) {
-        for (const QString& name : albumFiles()) {
-            EXPECT_FALSE(name.startsWith('.')) << "a partial import: " << name.toStdString();
-            const auto clip =
-                platform::Asset::assetWithURL(QUrl::fromLocalFile(album.filePath(name)));
-            EXPECT_TRUE(clip->isPlayable()) << name.toStdString();
-            EXPECT_NEAR(clip->duration().seconds(), seconds, 0.2) << name.toStdString();
-        }
-    }
-
-    QStringList storeEntries() const {
-        return QDir(store()).entryList(QDir::AllEntries | QDir::Hidden | QDir::NoDotAndDotDot);
-    }
-};
+using Faults = EndToEnd;
 
 TEST_F(Faults, ADiskThatFillsUpMidExportLeavesNothingBehind) {
     // A file size limit stands in for the full disk: the write that crosses
@@ -101,13 +61,13 @@ TEST_F(Faults, ADiskThatFillsUpMidExportLeavesNothingBehind) {
     // user closes the window.
     const Run run = edit("wait ready\ndrag end 9\ntap trimButton\nwait log \"Export Trim Video\" "
                          "60\ndismiss\n",
-                         {}, {}, environmentWith("TAMSEL_LOG_STDERR", "1"));
+                         {}, {}, loggingToStderr());
     ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
     EXPECT_TRUE(run.err.contains("TQVideoEditorViewController: Export Trim Video Failed, due to "
                                  "error: "))
         << run.err.toStdString();
     EXPECT_EQ(run.hostReport, "[]");
-    EXPECT_TRUE(storeEntries().isEmpty()) << storeEntries().join(", ").toStdString();
+    EXPECT_TRUE(tempFiles().isEmpty()) << tempFiles().join(", ").toStdString();
     EXPECT_TRUE(albumFiles().isEmpty());
     EXPECT_EQ(hashOf(recording()), original);
 }
@@ -117,12 +77,8 @@ TEST_F(Faults, AnAlbumThatCannotBeWrittenLosesNothing) {
     QFile blocker(mobile.filePath("not-a-folder"));
     ASSERT_TRUE(blocker.open(QIODevice::WriteOnly));
     blocker.close();
-    const QProcessEnvironment env = [&] {
-        QProcessEnvironment e;
-        e.insert("TAMSEL_ALBUM_DIR", blocker.fileName() + "/Screen Recordings");
-        e.insert("TAMSEL_LOG_STDERR", "1");
-        return e;
-    }();
+    QProcessEnvironment env = loggingToStderr();
+    env.insert("TAMSEL_ALBUM_DIR", blocker.fileName() + "/Screen Recordings");
     const QByteArray original = hashOf(recording());
 
     const Run trimmed = edit("wait ready\ndrag end 4\ntap trimButton\nwait exporting=false "
@@ -130,7 +86,7 @@ TEST_F(Faults, AnAlbumThatCannotBeWrittenLosesNothing) {
                              {}, {}, env);
     ASSERT_EQ(trimmed.exitCode, 0) << trimmed.err.toStdString();
     EXPECT_TRUE(trimmed.err.contains("photo album: ")) << trimmed.err.toStdString();
-    EXPECT_TRUE(storeEntries().isEmpty()) << storeEntries().join(", ").toStdString();
+    EXPECT_TRUE(tempFiles().isEmpty()) << tempFiles().join(", ").toStdString();
 
     const Run untrimmed = edit("wait ready\ntap saveButton\n", {}, {}, env);
     ASSERT_EQ(untrimmed.exitCode, 0) << untrimmed.err.toStdString();
@@ -143,26 +99,23 @@ TEST_F(Faults, AnAlbumThatCannotBeWrittenLosesNothing) {
 
 TEST_F(Faults, AHostKilledDuringAnExportLeavesNoPartialClip) {
     const QString movie = mobile.filePath("long.mp4");
-    testmedia::MovieSpec movieSpec;
-    movieSpec.seconds = 20;
-    movieSpec.width = 640;
-    movieSpec.height = 360;
-    movieSpec.bFrames = 2; // reordered frames: the export goes through the remuxer
-    ASSERT_TRUE(testmedia::writeMovie(movie, movieSpec));
+    // Reordered frames: the export goes through the remuxer.
+    ASSERT_TRUE(
+        testmedia::writeMovie(movie, {.width = 640, .height = 360, .seconds = 20, .bFrames = 2}));
     const QByteArray original = hashOf(movie);
 
     QProcess host;
-    startHost(host, movie, "wait ready\ndrag end 19\ntap trimButton\nsleep 60\n");
+    start(host, "wait ready\ndrag end 19\ntap trimButton\nsleep 60\n", movie);
     qint64 extension = 0;
     ASSERT_TRUE(pollUntil([&] { return (extension = childOf(host.processId())) != 0; }, 20000));
     // The moment the export's first file shows in the store, the host dies.
-    const bool seen = pollUntil([&] { return !storeEntries().isEmpty(); }, 60000);
+    const bool seen = pollUntil([&] { return !tempFiles().isEmpty(); }, 60000);
     host.kill();
     host.waitForFinished();
     ASSERT_TRUE(pollUntil([&] { return processEnded(extension); }, 60000, 20))
         << "the extension outlived its host";
     RecordProperty("exportSeenBeforeTheKill", seen ? "yes" : "no");
-    EXPECT_TRUE(storeEntries().isEmpty()) << storeEntries().join(", ").toStdString();
+    EXPECT_TRUE(tempFiles().isEmpty()) << tempFiles().join(", ").toStdString();
     expectWholeClipsOnly(19.0);
     EXPECT_EQ(hashOf(movie), original);
 }
@@ -171,7 +124,7 @@ TEST_F(Faults, AnExtensionKilledDuringAnAlbumWriteLeavesNoPartialClip) {
     const QString movie = mobile.filePath("large.mp4");
     ASSERT_TRUE(writeLargeRecording(movie, recording(), 160 << 20));
     QProcess host;
-    startHost(host, movie, "wait ready\ntap saveButton\nsleep 60\n");
+    start(host, "wait ready\ntap saveButton\nsleep 60\n", movie);
     qint64 extension = 0;
     ASSERT_TRUE(pollUntil([&] { return (extension = childOf(host.processId())) != 0; }, 20000));
     // The untrimmed save tells the host first, then writes to the album.
@@ -202,19 +155,8 @@ TEST_F(Faults, ALargeUntrimmedSaveAcrossFileSystemsArrivesWhole) {
     ASSERT_TRUE(writeLargeRecording(movie, recording(), size));
     const Run run = edit("wait ready\ntap saveButton\n", movie);
     ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
-    ASSERT_EQ(albumFiles(), QStringList{"large.mp4"});
+    EXPECT_EQ(run.hostReport, kSavedToAlbumReport);
+    ASSERT_EQ(albumFiles(), QStringList{"large.mp4"})
+        << "the album write finishes before the process ends";
     EXPECT_EQ(hashOf(album.filePath("large.mp4")), hashOf(movie));
-}
-
-TEST_F(Faults, DoneTheInstantATrimmedSaveEndsStillPutsTheWholeClipInTheAlbum) {
-    // The tear-down removes the clip from the store; the album's import of
-    // it, queued a moment before, must not lose it.
-    for (int round = 0; round < 5; ++round) {
-        const Run run = edit(
-            "wait ready\ndrag end 5\ntap trimButton\nwait exporting=false 60\ntap doneButton\n");
-        ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
-        EXPECT_EQ(albumFiles().size(), round + 1) << "round " << round;
-        expectWholeClipsOnly(5.0);
-        EXPECT_TRUE(storeEntries().isEmpty()) << storeEntries().join(", ").toStdString();
-    }
 }

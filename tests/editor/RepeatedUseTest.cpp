@@ -61,7 +61,10 @@ tap doneButton
 )");
         expectNormalEnd(run, round);
         EXPECT_EQ(run.hostReport, kSavedToAlbumReport) << "round " << round;
+        // Done the instant the save finished: the tear-down's removal of the
+        // clip must not overtake the album's import of it.
         EXPECT_EQ(albumFiles().size(), round + 1) << "round " << round;
+        expectWholeClipsOnly(1.2);
         EXPECT_TRUE(tempFiles().isEmpty()) << "round " << round;
     }
 }

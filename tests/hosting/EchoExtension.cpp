@@ -1,6 +1,6 @@
 // A stand-in extension for the launcher's tests: it answers a request with the
-// titles of its input items as activity types, ends when dismissed or when
-// the host goes away, and crashes on request. Dismissed, it can keep working
+// titles of its input items as activity types and ends when dismissed or
+// when the host goes away. Dismissed, it can keep working
 // (--busy-after-dismiss MS: queued work that takes that long) or stop
 // answering altogether (--hang-after-dismiss).
 
@@ -10,7 +10,6 @@
 
 #include <QCoreApplication>
 #include <QThread>
-#include <cstdlib>
 
 int main(int argc, char** argv) {
     QCoreApplication app(argc, argv);
@@ -23,8 +22,6 @@ int main(int argc, char** argv) {
         platform::InterfaceDescription{"Host", {"extensionDidFinishWithActivityTypes:"}});
 
     endpoint->onRequest = [&](QList<platform::ExtensionItem> items) {
-        if (arguments.contains("--crash") || qEnvironmentVariableIsSet("TAMSEL_ECHO_CRASH"))
-            std::abort();
         QStringList titles;
         for (const auto& item : items)
             titles.append(item.attributedTitle);

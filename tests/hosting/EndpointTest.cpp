@@ -48,18 +48,6 @@ TEST(MessageFrameReader, MessagesComeWholeHoweverTheBytesArePortioned) {
     }
 }
 
-TEST(MessageFrameReader, AStreamThatLostItsFramingStaysLost) {
-    MessageFrameReader reader;
-    const QByteArray notAMap = QByteArray("\x00\x00\x00\x01", 4) + QByteArray("\x05", 1);
-    reader.append(notAMap.constData(), notAMap.size());
-    QCborMap message;
-    EXPECT_EQ(reader.next(&message), MessageFrameReader::Result::Malformed);
-    // A good frame after it is not believed.
-    const QByteArray good = MessageFrameReader::frame(QCborMap{{"n", 1}});
-    reader.append(good.constData(), good.size());
-    EXPECT_EQ(reader.next(&message), MessageFrameReader::Result::Malformed);
-}
-
 TEST(HostMessages, AReportKeepsItsStringsAndNothingElseIsAReport) {
     const QCborMap report{{"type", HostMessages::Invoke},
                           {"selector", "extensionDidFinishWithActivityTypes:"},

@@ -71,12 +71,9 @@ ClipInfo probeClip(const QString& path, int maxFrames) {
     for (unsigned i = 0; i < k.in->nb_streams; ++i) {
         AVStream* s = k.in->streams[i];
         if (s->codecpar->codec_type == AVMEDIA_TYPE_VIDEO) {
-            ++info.videoTracks;
             if (videoIndex < 0) {
                 videoIndex = int(i);
                 info.videoCodec = QString::fromLatin1(avcodec_get_name(s->codecpar->codec_id));
-                info.width = s->codecpar->width;
-                info.height = s->codecpar->height;
                 info.videoDuration = s->duration * av_q2d(s->time_base);
                 size_t size = 0;
                 if (const auto* m = reinterpret_cast<const int32_t*>(
@@ -108,6 +105,7 @@ ClipInfo probeClip(const QString& path, int maxFrames) {
                         {t, testmedia::readFrameIndex(k.frame->data[0], k.frame->width,
                                                       k.frame->height, k.frame->linesize[0])});
             } else if (k.frame->format == AV_SAMPLE_FMT_FLTP) {
+                info.audioStart = std::min(info.audioStart, t);
                 info.audioEnd =
                     std::max(info.audioEnd, t + double(k.frame->nb_samples) / k.frame->sample_rate);
                 const float* samples = reinterpret_cast<const float*>(k.frame->extended_data[0]);
@@ -134,9 +132,9 @@ ClipInfo probeClip(const QString& path, int maxFrames) {
                 info.decodeTimesRise = false;
             lastDts[index] = k.packet->dts;
         }
-        if (index == videoIndex && info.firstVideoPacket.isEmpty())
-            info.firstVideoPacket =
-                QByteArray(reinterpret_cast<const char*>(k.packet->data), k.packet->size);
+        if (index == videoIndex && (k.packet->flags & AV_PKT_FLAG_KEY))
+            info.keyframes.append(
+                QByteArray(reinterpret_cast<const char*>(k.packet->data), k.packet->size));
         AVCodecContext* c = index == videoIndex ? k.video : index == audioIndex ? k.audio : nullptr;
         if (c) {
             avcodec_send_packet(c, k.packet);
@@ -154,22 +152,6 @@ ClipInfo probeClip(const QString& path, int maxFrames) {
     }
     info.errorLines = errorLines;
     return info;
-}
-
-QList<QByteArray> videoKeyframes(const QString& path) {
-    QList<QByteArray> keyframes;
-    Closer k;
-    if (avformat_open_input(&k.in, QFile::encodeName(path).constData(), nullptr, nullptr) < 0 ||
-        avformat_find_stream_info(k.in, nullptr) < 0)
-        return keyframes;
-    const int video = av_find_best_stream(k.in, AVMEDIA_TYPE_VIDEO, -1, -1, nullptr, 0);
-    while (av_read_frame(k.in, k.packet) >= 0) {
-        if (k.packet->stream_index == video && (k.packet->flags & AV_PKT_FLAG_KEY))
-            keyframes.append(
-                QByteArray(reinterpret_cast<const char*>(k.packet->data), k.packet->size));
-        av_packet_unref(k.packet);
-    }
-    return keyframes;
 }
 
 } // namespace mediatest

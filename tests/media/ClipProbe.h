@@ -24,12 +24,11 @@ struct ClipInfo {
     QString videoCodec; // FFmpeg's codec names
     QString audioCodec;
     double startTime = 0; // seconds, of the earliest stream (what players count from)
-    int videoTracks = 0;
     int audioTracks = 0;
-    int width = 0, height = 0;
     QTransform transform;     // from the display matrix
     double videoDuration = 0; // seconds, from the container
     double audioDuration = 0;
+    double audioStart = 1e9;         // seconds, where the first decoded audio sample starts
     double audioEnd = 0;             // seconds, where the last decoded audio sample ends
     std::vector<ShownFrame> frames;  // decoded, up to maxFrames
     std::vector<double> burstOnsets; // seconds, where the audio rises above half scale
@@ -38,16 +37,13 @@ struct ClipInfo {
     int errorLines = 0;
     // Every track's decode times rise from packet to packet.
     bool decodeTimesRise = true;
-    // The first video packet's payload, to tell a copied stream from an
-    // encoded one.
-    QByteArray firstVideoPacket;
+    // The video's keyframe payloads in file order, to tell a copied stream
+    // from an encoded one.
+    QList<QByteArray> keyframes;
 };
 
 // Decodes up to `maxFrames` video frames (all when -1) and the whole audio.
 // Not to be called while another thread uses FFmpeg's log.
 ClipInfo probeClip(const QString& path, int maxFrames = -1);
-
-// The payloads of a movie's video keyframes, in file order.
-QList<QByteArray> videoKeyframes(const QString& path);
 
 } // namespace mediatest

@@ -112,16 +112,6 @@ TEST(CutPlanner, MovingTheStartBackKeepsTheEnd) {
     EXPECT_TRUE(startingAt(TrackCut{}, 0).empty);
 }
 
-TEST(CutPlanner, SyncSampleLookup) {
-    const std::vector<SyncSample> s = {{0, 0}, {10, 10}, {20, 20}};
-    EXPECT_EQ(syncSampleAtOrBefore(s, -5), 0);
-    EXPECT_EQ(syncSampleAtOrBefore(s, 0), 0);
-    EXPECT_EQ(syncSampleAtOrBefore(s, 19), 1);
-    EXPECT_EQ(syncSampleAtOrBefore(s, 20), 2);
-    EXPECT_EQ(syncSampleAtOrBefore(s, 1000), 2);
-    EXPECT_EQ(syncSampleAtOrBefore({}, 5), -1);
-}
-
 // Matroska cues often list only the video's keyframes: the audio must still
 // be planned (and read from early enough to keep its priming), and video
 // without an index is read from the start itself, the reader finding the

@@ -2,9 +2,11 @@
 
 #include "ClipProbe.h"
 #include "MediaGenerator.h"
+#include "platform/media/Asset.h"
 #include "platform/media/ExportSession.h"
 
 #include <QString>
+#include <gtest/gtest.h>
 
 #include <memory>
 #include <thread>
@@ -21,32 +23,34 @@ struct ExportRun {
     std::thread::id completionThread;
 
     bool runAndWait(int timeoutMs = 60000);
-    // The session's error, for test messages.
-    std::string why() const;
 };
 
-// A session on `source` writing `output` for [start, start + duration) in
-// seconds of the movie (0 is its first sample).
-std::shared_ptr<platform::ExportSession> makeSession(const QString& source, const QString& preset,
-                                                     const QString& output, double start,
-                                                     double duration);
+// A session on `asset` (or the movie at `source`) writing an MP4 to `output`
+// for [start, start + duration) in seconds of the movie (0 is its first
+// sample).
+std::shared_ptr<platform::ExportSession>
+makeSession(std::shared_ptr<platform::Asset> asset, const QString& output, double start,
+            double duration, const QString& preset = platform::ExportPresetPassthrough);
+std::shared_ptr<platform::ExportSession>
+makeSession(const QString& source, const QString& output, double start, double duration,
+            const QString& preset = platform::ExportPresetPassthrough);
 
-// The index of the frame shown at `seconds` of the generator's timeline.
-int frameAt(const testmedia::MovieSpec& movieSpec, double seconds);
+// Runs the export; success when it completed, else the session's error.
+testing::AssertionResult completes(ExportRun& run, int timeoutMs = 120000);
+testing::AssertionResult completes(const std::shared_ptr<platform::ExportSession>& session,
+                                   int timeoutMs = 120000);
 
 // Temporary files of the export left beside `output`.
 bool leftovers(const QString& output);
 
 // The clip at `output`, cut from a movie made from `movieSpec` (`source`)
 // for [start, start + duration) of the movie, is what a user asked for: an
-// MP4 that decodes without one error line, with rising decode times, whose
-// first picture is the one the movie showed at `start`, that lasts the range
-// within a frame, and whose audio bursts fall where the pictures say (the
-// second track's too when `mixed`).
+// MP4 that decodes without one error line, with rising decode times, turned
+// as the movie is, whose first picture is the one the movie showed at
+// `start`, that lasts the range within a frame, whose audio bursts fall where
+// the pictures say (the second track's too when `mixed`), with no temporary
+// file left beside it.
 void expectFaithfulCut(const testmedia::MovieSpec& movieSpec, const QString& source,
                        const QString& output, double start, double duration, bool mixed = false);
-
-// A checksum of a file's bytes, to show that a recording was not written to.
-QByteArray fileDigest(const QString& path);
 
 } // namespace mediatest

@@ -1,6 +1,6 @@
 // A pass-through export in a process of its own, for the tests that measure
 // one: tamsel-test-export SOURCE OUTPUT START DURATION. Exits 0 when the
-// export completed.
+// export completed, printing the process's peak resident memory in KiB.
 
 #include "platform/media/Asset.h"
 #include "platform/media/ExportSession.h"
@@ -8,7 +8,10 @@
 #include <QCoreApplication>
 #include <QFile>
 
+#include <sys/resource.h>
+
 #include <condition_variable>
+#include <cstdio>
 #include <mutex>
 
 using namespace platform;
@@ -34,5 +37,8 @@ int main(int argc, char** argv) {
     });
     std::unique_lock lock(m);
     cv.wait(lock, [&] { return done; });
+    rusage usage{};
+    getrusage(RUSAGE_SELF, &usage);
+    std::printf("%ld\n", usage.ru_maxrss);
     return session->status() == int(ExportSessionStatus::Completed) ? 0 : 1;
 }

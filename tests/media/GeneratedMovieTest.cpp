@@ -1,10 +1,9 @@
-// The generated recordings and how the asset reads them.
+// The generated recordings that every media test relies on, and how the
+// asset describes one.
 #include "ClipProbe.h"
 #include "MediaFixtures.h"
 #include "platform/media/Asset.h"
 
-#include "support/TempDir.h"
-#include <QFile>
 #include <gtest/gtest.h>
 
 using namespace platform;
@@ -12,9 +11,7 @@ using mediatest::movieFor;
 using mediatest::probeClip;
 
 TEST(GeneratedMovie, EveryFrameCarriesItsIndexAndEverySecondItsBurst) {
-    testmedia::MovieSpec movieSpec;
-    movieSpec.seconds = 3;
-    movieSpec.variableFrameRate = true;
+    const testmedia::MovieSpec movieSpec{.seconds = 3, .variableFrameRate = true};
     const mediatest::ClipInfo clip = probeClip(movieFor(movieSpec));
     ASSERT_EQ(int(clip.frames.size()), testmedia::frameCount(movieSpec));
     for (size_t i = 0; i < clip.frames.size(); ++i) {
@@ -35,21 +32,8 @@ TEST(GeneratedMovie, EveryFrameCarriesItsIndexAndEverySecondItsBurst) {
     EXPECT_NEAR(clip.audioDuration, 3.0, 1.0 / movieSpec.fps);
 }
 
-TEST(GeneratedMovie, FrameCodeSurvivesScalingAndRejectsOtherPictures) {
-    QImage frame(320, 240, QImage::Format_RGB32);
-    frame.fill(Qt::black);
-    EXPECT_EQ(testmedia::readFrameIndex(frame), 0);
-    frame.fill(QColor(128, 128, 128));
-    EXPECT_EQ(testmedia::readFrameIndex(frame), -1);
-    EXPECT_EQ(testmedia::readFrameIndex(QImage()), -1);
-}
-
 TEST(Asset, DescribesTracksSizesTransformAndDuration) {
-    testmedia::MovieSpec movieSpec;
-    movieSpec.width = 320;
-    movieSpec.height = 180;
-    movieSpec.rotationDegrees = 90;
-    movieSpec.seconds = 2;
+    const testmedia::MovieSpec movieSpec{.height = 180, .rotationDegrees = 90};
     const auto asset = Asset::assetWithURL(QUrl::fromLocalFile(movieFor(movieSpec)));
     ASSERT_FALSE(asset->error());
     EXPECT_TRUE(asset->isPlayable());
@@ -67,56 +51,10 @@ TEST(Asset, DescribesTracksSizesTransformAndDuration) {
     EXPECT_EQ(video.preferredTransform, QTransform(0, 1, -1, 0, 180, 0));
     EXPECT_EQ(video.preferredTransform.mapRect(QRectF(QPointF(), video.naturalSize)),
               QRectF(0, 0, 180, 320));
+    // The probe that checks saved clips reads the same turn.
+    EXPECT_EQ(probeClip(movieFor(movieSpec), 1).transform, video.preferredTransform);
     EXPECT_NEAR(video.timeRange.duration.seconds(), 2.0, 1e-6);
     EXPECT_NEAR(asset->duration().seconds(), 2.0, 0.03);
     EXPECT_EQ(asset->duration().timescale, 90000);
     EXPECT_EQ(asset->tracksWithMediaType(MediaType::Audio).first().naturalTimeScale, 48000);
-}
-
-TEST(Asset, SilentMovieHasOnlyItsVideoTrack) {
-    testmedia::MovieSpec movieSpec;
-    movieSpec.audio = false;
-    const auto asset = Asset::assetWithURL(QUrl::fromLocalFile(movieFor(movieSpec)));
-    EXPECT_EQ(asset->tracks().size(), 1);
-    EXPECT_TRUE(asset->tracksWithMediaType(MediaType::Audio).isEmpty());
-    EXPECT_TRUE(asset->tracks().first().preferredTransform.isIdentity());
-}
-
-TEST(Asset, WhatIsNotAMovieGivesNoTracksAndAnError) {
-    testmedia::MovieSpec truncated;
-    truncated.truncated = true;
-    const QString text = mediatest::scratchPath(QStringLiteral("readme.mov"));
-    {
-        QFile f(text);
-        ASSERT_TRUE(f.open(QIODevice::WriteOnly));
-        f.write(QByteArray(4096, 'x'));
-    }
-    const QString empty = mediatest::scratchPath(QStringLiteral("empty.mp4"));
-    QFile(empty).open(QIODevice::WriteOnly);
-    for (const QUrl& url :
-         {QUrl::fromLocalFile(movieFor(truncated)), QUrl::fromLocalFile(text),
-          QUrl::fromLocalFile(empty), QUrl::fromLocalFile(QStringLiteral("/no/such/movie.mp4")),
-          QUrl(QStringLiteral("https://example.invalid/movie.mp4")), QUrl()}) {
-        SCOPED_TRACE(url.toString().toStdString());
-        const auto asset = Asset::assetWithURL(url);
-        ASSERT_TRUE(asset);
-        EXPECT_TRUE(asset->tracks().isEmpty());
-        ASSERT_TRUE(asset->error());
-        EXPECT_NE(asset->error()->code(), 0);
-        EXPECT_FALSE(asset->isPlayable());
-        EXPECT_FALSE(asset->duration().isValid());
-        EXPECT_EQ(asset->url(), url);
-    }
-}
-
-TEST(Asset, MapsDevicePaths) {
-    testing_support::MobileRoot root;
-    root.makeLibrary();
-    testmedia::MovieSpec movieSpec;
-    ASSERT_TRUE(
-        QFile::copy(movieFor(movieSpec), root.hostPath(QStringLiteral("Library/Tamsel/clip.mp4"))));
-    const auto asset = Asset::assetWithURL(
-        QUrl::fromLocalFile(QStringLiteral("/private/var/mobile/Library/Tamsel/clip.mp4")));
-    EXPECT_FALSE(asset->error());
-    EXPECT_EQ(asset->tracks().size(), 2);
 }

@@ -2,6 +2,7 @@
 
 #include <QHash>
 #include <QTemporaryDir>
+#include <QTextStream>
 #include <gtest/gtest.h>
 
 #include <mutex>
@@ -15,31 +16,14 @@ QTemporaryDir& runDirectory() {
 }
 
 QString keyOf(const testmedia::MovieSpec& s) {
-    const QList<double> fields = {double(s.width),
-                                  double(s.height),
-                                  s.fps,
-                                  s.seconds,
-                                  double(s.audio),
-                                  double(s.rotationDegrees),
-                                  double(s.keyframeInterval),
-                                  double(s.variableFrameRate),
-                                  double(s.truncated),
-                                  double(s.fastStart),
-                                  double(s.bFrames),
-                                  double(s.crf),
-                                  double(s.scene),
-                                  double(s.audioSampleRate),
-                                  s.audioStart,
-                                  double(s.container),
-                                  double(s.videoCodec),
-                                  double(s.audioCodec),
-                                  double(s.audioTracks),
-                                  double(s.segmentIndex),
-                                  s.startSeconds};
-    QStringList parts;
-    for (double f : fields)
-        parts.append(QString::number(f));
-    return parts.join(QLatin1Char('_')) + QLatin1Char('_') + s.x264Preset;
+    QString key;
+    QTextStream(&key) << s.width << 'x' << s.height << '_' << s.fps << '_' << s.seconds << '_'
+                      << s.audio << s.rotationDegrees << '_' << s.keyframeInterval << '_'
+                      << s.variableFrameRate << s.truncated << s.fastStart << s.bFrames << '_'
+                      << s.crf << s.scene << '_' << s.audioSampleRate << '_' << s.audioStart << '_'
+                      << int(s.container) << int(s.videoCodec) << int(s.audioCodec) << s.audioTracks
+                      << s.segmentIndex << '_' << s.startSeconds << '_' << s.x264Preset;
+    return key;
 }
 
 } // namespace

@@ -1,6 +1,7 @@
 // The highest-quality preset makes the upload file: what MP4 holds and the
 // video sites take is copied untouched, the rest encoded, and the audio
-// tracks that the mix names are heard together in one track.
+// tracks that the mix names are heard together in one track, at the mix's
+// volume.
 
 #include "ExportChecks.h"
 #include "MediaFixtures.h"
@@ -10,33 +11,24 @@
 
 using namespace platform;
 using namespace mediatest;
-using testmedia::AudioCodec;
-using testmedia::Container;
 using testmedia::MovieSpec;
-using testmedia::VideoCodec;
+using C = testmedia::Container;
+using V = testmedia::VideoCodec;
+using A = testmedia::AudioCodec;
 
 namespace {
 
-MovieSpec recording(Container container, VideoCodec video, AudioCodec audio) {
-    MovieSpec s;
-    s.seconds = 3;
-    s.container = container;
-    s.videoCodec = video;
-    s.audioCodec = audio;
-    return s;
-}
-
-// The whole recording, as the upload is prepared, with an audio mix naming
-// every audio track.
-std::shared_ptr<ExportSession> uploadSession(const QString& source, const QString& output) {
-    auto session = ExportSession::exportSessionWithAsset_presetName(
-        Asset::assetWithURL(QUrl::fromLocalFile(source)), ExportPresetHighestQuality);
-    session->setOutputURL(QUrl::fromLocalFile(output));
-    session->setOutputFileType(FileTypeMPEG4);
+// The upload of [start, start + duration), with an audio mix naming every
+// audio track at `volume`.
+std::shared_ptr<ExportSession> uploadSession(const QString& source, const QString& output,
+                                             double start, double duration, float volume = 1) {
+    auto session = makeSession(source, output, start, duration, ExportPresetHighestQuality);
     AudioMix mix;
-    for (const AssetTrack& track : session->asset()->tracksWithMediaType(MediaType::Audio))
+    for (const AssetTrack& track : session->asset()->tracksWithMediaType(MediaType::Audio)) {
         mix.inputParameters.append(
             AudioMixInputParameters::audioMixInputParametersWithTrack(track));
+        mix.inputParameters.last().volume = volume;
+    }
     session->setAudioMix(mix);
     return session;
 }
@@ -44,35 +36,29 @@ std::shared_ptr<ExportSession> uploadSession(const QString& source, const QStrin
 } // namespace
 
 TEST(UploadPreset, CopiesWhatTheSitesTakeUntouchedAndEncodesTheRest) {
-    struct Case {
-        const char* name;
+    const struct {
         MovieSpec movie;
-        const char* video;
-        const char* audio;
+        const char* codecs; // of the upload, video then audio
         bool videoCopied;
+    } cases[] = {
+        {{.seconds = 3, .container = C::WebM, .videoCodec = V::VP9, .audioCodec = A::Opus},
+         "vp9 opus",
+         true},
+        {{.seconds = 3, .container = C::Matroska, .videoCodec = V::HEVC}, "hevc aac", true},
+        {{.seconds = 3, .rotationDegrees = 270, .videoCodec = V::H264_444}, "h264 aac", true},
+        {{.seconds = 3, .container = C::WebM, .videoCodec = V::VP8, .audioCodec = A::Vorbis},
+         "h264 aac",
+         false},
     };
-    const Case cases[] = {
-        {"VP9 and Opus", recording(Container::WebM, VideoCodec::VP9, AudioCodec::Opus), "vp9",
-         "opus", true},
-        {"HEVC and AAC", recording(Container::Matroska, VideoCodec::HEVC, AudioCodec::AAC), "hevc",
-         "aac", true},
-        {"H.264 4:4:4", recording(Container::Mp4, VideoCodec::H264_444, AudioCodec::AAC), "h264",
-         "aac", true},
-        {"VP8 and Vorbis", recording(Container::WebM, VideoCodec::VP8, AudioCodec::Vorbis), "h264",
-         "aac", false},
-    };
-    for (const Case& c : cases) {
-        SCOPED_TRACE(c.name);
+    for (const auto& c : cases) {
+        SCOPED_TRACE(testmedia::suffixFor(c.movie).toStdString() + " to " + c.codecs);
         const QString source = movieFor(c.movie);
         const QString output = scratchPath(QStringLiteral("upload.mp4"));
-        ExportRun run{uploadSession(source, output)};
-        ASSERT_TRUE(run.runAndWait(120000));
-        ASSERT_EQ(run.session->status(), int(ExportSessionStatus::Completed)) << run.why();
+        ASSERT_TRUE(completes(uploadSession(source, output, 0, c.movie.seconds)));
         const ClipInfo clip = probeClip(output);
-        EXPECT_EQ(clip.videoCodec.toStdString(), c.video);
-        EXPECT_EQ(clip.audioCodec.toStdString(), c.audio);
+        EXPECT_EQ(clip.videoCodec + ' ' + clip.audioCodec, QLatin1String(c.codecs));
         // Copied means the very bytes: no generation loss.
-        EXPECT_EQ(videoKeyframes(source).contains(clip.firstVideoPacket), c.videoCopied);
+        EXPECT_EQ(probeClip(source).keyframes.contains(clip.keyframes.value(0)), c.videoCopied);
         expectFaithfulCut(c.movie, source, output, 0, c.movie.seconds);
     }
 }
@@ -80,27 +66,33 @@ TEST(UploadPreset, CopiesWhatTheSitesTakeUntouchedAndEncodesTheRest) {
 // A desktop track and a microphone track become one track in which both are
 // heard, each where it was; the video is copied as it is.
 TEST(UploadPreset, MixesTheNamedAudioTracksIntoOne) {
-    MovieSpec movieSpec = recording(Container::Mp4, VideoCodec::H264, AudioCodec::AAC);
-    movieSpec.audioTracks = 2;
-    movieSpec.seconds = 4;
+    const MovieSpec movieSpec{.seconds = 4, .audioTracks = 2};
     const QString source = movieFor(movieSpec);
     const QString output = scratchPath(QStringLiteral("mixed.mp4"));
-    ExportRun run{uploadSession(source, output)};
-    ASSERT_TRUE(run.runAndWait(120000));
-    ASSERT_EQ(run.session->status(), int(ExportSessionStatus::Completed)) << run.why();
+    ASSERT_TRUE(completes(uploadSession(source, output, 0, movieSpec.seconds)));
     const ClipInfo clip = probeClip(output);
-    EXPECT_TRUE(videoKeyframes(source).contains(clip.firstVideoPacket));
+    EXPECT_TRUE(probeClip(source).keyframes.contains(clip.keyframes.value(0)));
     expectFaithfulCut(movieSpec, source, output, 0, movieSpec.seconds, true);
     // Summed, not averaged: each burst as loud as in its own track.
     EXPECT_NEAR(clip.audioPeak, 0.5, 0.08);
 
     // From inside a keyframe interval the mix starts where the video does.
     const QString cut = scratchPath(QStringLiteral("mixed-cut.mp4"));
-    auto session = uploadSession(source, cut);
-    session->setTimeRange(
-        MediaTimeRange::make(MediaTime::fromSeconds(0.9, 600), MediaTime::fromSeconds(2.4, 600)));
-    ExportRun part{session};
-    ASSERT_TRUE(part.runAndWait(120000));
-    ASSERT_EQ(part.session->status(), int(ExportSessionStatus::Completed)) << part.why();
+    ASSERT_TRUE(completes(uploadSession(source, cut, 0.9, 2.4)));
     expectFaithfulCut(movieSpec, source, cut, 0.9, 2.4, true);
+}
+
+// A volume other than 1 needs the audio encoded; the video is still copied.
+TEST(UploadPreset, EncodesTheAudioAtTheMixVolume) {
+    const MovieSpec movieSpec;
+    const QString source = movieFor(movieSpec);
+    const QString output = scratchPath(QStringLiteral("quiet.mp4"));
+    ASSERT_TRUE(completes(uploadSession(source, output, 0.5, 1.0, 0.25f)));
+    const ClipInfo clip = probeClip(output);
+    ASSERT_FALSE(clip.frames.empty());
+    EXPECT_EQ(clip.frames.front().index, 15);
+    EXPECT_NEAR(clip.videoDuration, 1.0, 1.0 / movieSpec.fps);
+    // The bursts peak at 0.5 in the source; a quarter of that here.
+    EXPECT_NEAR(clip.audioPeak, 0.125, 0.03);
+    EXPECT_TRUE(probeClip(source).keyframes.contains(clip.keyframes.value(0)));
 }

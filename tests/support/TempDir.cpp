@@ -1,5 +1,6 @@
 #include "TempDir.h"
 
+#include <QCryptographicHash>
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
@@ -53,6 +54,15 @@ void writeFile(const QString& hostPath, qint64 size) {
     QFile file(hostPath);
     if (file.open(QIODevice::WriteOnly))
         file.write(QByteArray(size, 'x'));
+}
+
+QByteArray hashOf(const QString& path) {
+    QFile file(path);
+    if (!file.open(QIODevice::ReadOnly))
+        return {};
+    QCryptographicHash hash(QCryptographicHash::Sha256);
+    hash.addData(&file);
+    return hash.result();
 }
 
 } // namespace testing_support

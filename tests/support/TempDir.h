@@ -42,4 +42,8 @@ class MobileRoot {
 // Writes `size` bytes to `hostPath`, creating parents.
 void writeFile(const QString& hostPath, qint64 size);
 
+// A checksum of a file's bytes (empty when it cannot be read), to show that
+// a file was not written to or arrived whole.
+QByteArray hashOf(const QString& path);
+
 } // namespace testing_support

@@ -42,43 +42,31 @@ QByteArray contents(const QString& path) {
 
 } // namespace
 
-TEST_F(FileManagerFixture, RemovalCompletesOnAWorkerThread) {
+// On a worker thread; removing nothing is no error; a failure is logged
+// with its code at default level.
+TEST_F(FileManagerFixture, RemovalCompletesOnAWorkerThreadAndLogsOnlyAFailure) {
     addFile("clip.mp4", 5);
-    Outcome outcome;
-    manager->_srRemoveFile_completion(tempUrl("clip.mp4"), outcome.completion());
-    ASSERT_TRUE(outcome.wait());
-    EXPECT_FALSE(outcome.error);
-    EXPECT_FALSE(outcome.onMainThread);
-    EXPECT_TRUE(outcome.onWorker);
+    addFile("locked.mp4", 5);
+    fileSystem->failRemovalOf("locked.mp4", 13);
+    for (const char* name : {"clip.mp4", "never-there.mp4", "locked.mp4"}) {
+        SCOPED_TRACE(name);
+        Outcome outcome;
+        manager->_srRemoveFile_completion(tempUrl(name), outcome.completion());
+        ASSERT_TRUE(outcome.wait());
+        EXPECT_FALSE(outcome.onMainThread);
+        EXPECT_TRUE(outcome.onWorker);
+        EXPECT_EQ(outcome.error ? outcome.error->code() : 0, name[0] == 'l' ? 13 : 0);
+    }
     EXPECT_FALSE(exists("clip.mp4"));
-    EXPECT_TRUE(logs.texts().isEmpty());
-}
+    EXPECT_EQ(fileSystem->removals(), (QStringList{"clip.mp4", "locked.mp4"}));
+    EXPECT_EQ(logs.lines(),
+              (QList<testing_support::LogLine>{{LogLevel::Default, "_tqRemoveFile error: 13"}}));
 
-TEST_F(FileManagerFixture, RemovingNothingIsNotAnError) {
-    Outcome outcome;
-    manager->_srRemoveFile_completion(tempUrl("never-there.mp4"), outcome.completion());
-    ASSERT_TRUE(outcome.wait());
-    EXPECT_FALSE(outcome.error);
-    EXPECT_TRUE(fileSystem->removals().isEmpty());
-    EXPECT_TRUE(logs.texts().isEmpty());
-
-    // And without a completion the job still runs to its end.
+    // Without a completion the job still runs to its end.
     addFile("quiet.mp4", 1);
     manager->_srRemoveFile_completion(tempUrl("quiet.mp4"), nullptr);
     platform::GlobalQueue::drain();
     EXPECT_FALSE(exists("quiet.mp4"));
-}
-
-TEST_F(FileManagerFixture, FailedRemovalLogsItsCodeAtDefaultLevel) {
-    addFile("locked.mp4", 5);
-    fileSystem->failRemovalOf("locked.mp4", 13);
-    Outcome outcome;
-    manager->_srRemoveFile_completion(tempUrl("locked.mp4"), outcome.completion());
-    ASSERT_TRUE(outcome.wait());
-    ASSERT_TRUE(outcome.error);
-    EXPECT_EQ(outcome.error->code(), 13);
-    EXPECT_EQ(logs.lines(),
-              (QList<testing_support::LogLine>{{LogLevel::Default, "_tqRemoveFile error: 13"}}));
 }
 
 TEST_F(FileManagerFixture, AQueuedJobKeepsItsFileManagerAlive) {
@@ -97,33 +85,33 @@ TEST_F(FileManagerFixture, AQueuedJobKeepsItsFileManagerAlive) {
     EXPECT_TRUE(waitUntil([&] { return weak.expired(); }));
 }
 
-TEST_F(FileManagerFixture, MoveReplacesTheDestination) {
+// A move replaces the destination; a missing source reports and logs the
+// error's identity.
+TEST_F(FileManagerFixture, MoveReplacesTheDestinationOrReportsAMissingSource) {
     testing_support::writeFile(tempHost("new.mp4"), 3);
     testing_support::writeFile(tempHost("old.mp4"), 9);
-    Outcome outcome;
+    testing_support::writeFile(tempHost("kept.mp4"), 4);
+    Outcome moved;
     manager->_srMoveFileFromURL_toURL_completion(tempUrl("new.mp4"), tempUrl("old.mp4"),
-                                                 outcome.completion());
-    ASSERT_TRUE(outcome.wait());
-    EXPECT_FALSE(outcome.error);
-    EXPECT_FALSE(outcome.onMainThread);
+                                                 moved.completion());
+    ASSERT_TRUE(moved.wait());
+    EXPECT_FALSE(moved.error);
+    EXPECT_FALSE(moved.onMainThread);
     EXPECT_FALSE(exists("new.mp4"));
     EXPECT_EQ(contents(tempHost("old.mp4")).size(), 3);
     EXPECT_TRUE(logs.texts().isEmpty());
-}
 
-TEST_F(FileManagerFixture, MoveOfAMissingSourceReportsAndLogsTheErrorIdentity) {
-    testing_support::writeFile(tempHost("kept.mp4"), 4);
-    Outcome outcome;
+    Outcome missing;
     manager->_srMoveFileFromURL_toURL_completion(tempUrl("gone.mp4"), tempUrl("other.mp4"),
-                                                 outcome.completion());
-    ASSERT_TRUE(outcome.wait());
-    ASSERT_TRUE(outcome.error);
-    EXPECT_EQ(outcome.error->code(), 2);
+                                                 missing.completion());
+    ASSERT_TRUE(missing.wait());
+    ASSERT_TRUE(missing.error);
+    EXPECT_EQ(missing.error->code(), 2);
     EXPECT_EQ(
         logs.lines(),
         (QList<testing_support::LogLine>{
             {LogLevel::Error,
-             QStringLiteral("_tqMoveFileFromURL error: %1").arg(outcome.error->identity())}}));
+             QStringLiteral("_tqMoveFileFromURL error: %1").arg(missing.error->identity())}}));
     EXPECT_TRUE(exists("kept.mp4"));
 }
 
@@ -142,30 +130,29 @@ TEST_F(FileManagerFixture, DeletionByPrefixIgnoresCaseAndAccents) {
     EXPECT_TRUE(logs.texts().isEmpty());
 }
 
+// A failure is carried and logged before each later entry's removal, so a
+// failure of the last entry is never logged.
 TEST_F(FileManagerFixture, DeletionByPrefixLogsACarriedErrorBeforeEachLaterEntry) {
-    for (const char* name : {"abc1", "abc2", "abc3"})
-        addFile(name, 1);
-    fileSystem->failRemovalOf("abc1");
-    manager->_srDeleteFilesWithPrefix("ABC");
-    platform::GlobalQueue::drain();
+    for (const char* failing : {"abc1", "abc3"}) {
+        SCOPED_TRACE(failing);
+        for (const char* name : {"abc1", "abc2", "abc3"})
+            addFile(name, 1);
+        auto fileSystem = std::make_shared<testing_support::ScriptedFileSystem>();
+        fileSystem->failRemovalOf(failing);
+        logs.clear();
+        FileManager::create(fileSystem)->_srDeleteFilesWithPrefix("ABC");
+        platform::GlobalQueue::drain();
 
-    const auto lines = logs.lines();
-    ASSERT_EQ(lines.size(), 2);
-    EXPECT_EQ(lines[0].level, LogLevel::Error);
-    EXPECT_TRUE(lines[0].text.startsWith("_tqDeleteFilesWithPrefix error: "));
-    EXPECT_EQ(lines[0], lines[1]) << "the same error, logged again";
-    EXPECT_FALSE(exists("abc2"));
-    EXPECT_FALSE(exists("abc3"));
-}
-
-TEST_F(FileManagerFixture, DeletionByPrefixNeverLogsAFailureOfTheLastEntry) {
-    for (const char* name : {"abc1", "abc2"})
-        addFile(name, 1);
-    fileSystem->failRemovalOf("abc2");
-    manager->_srDeleteFilesWithPrefix("abc");
-    platform::GlobalQueue::drain();
-    EXPECT_TRUE(logs.texts().isEmpty());
-    EXPECT_TRUE(exists("abc2"));
+        const auto lines = logs.lines();
+        ASSERT_EQ(lines.size(), failing == QLatin1String("abc1") ? 2 : 0);
+        for (const auto& line : lines)
+            EXPECT_EQ(line, lines[0]) << "the same error, logged again";
+        if (!lines.isEmpty()) {
+            EXPECT_EQ(lines[0].level, LogLevel::Error);
+            EXPECT_TRUE(lines[0].text.startsWith("_tqDeleteFilesWithPrefix error: "));
+        }
+        EXPECT_EQ(QDir(tempHost()).entryList(QDir::Files), QStringList{failing});
+    }
 }
 
 TEST(FileManagerMissingDirectory, DeletionByPrefixDoesNothingQuietly) {

@@ -20,12 +20,6 @@ const QString kPurgeError = QStringLiteral(
     "error in _tqRemoveFile_srDeleteFilesOlderThanTimeToLiveInSeconds, error code: %1");
 }
 
-TEST_F(FileManagerFixture, TempPathIsTheExportedDirectory) {
-    EXPECT_EQ(manager->_srTempPath(), QStringLiteral("/private/var/mobile/Library/Tamsel/"));
-    EXPECT_EQ(manager->_srTempPath(), TXScreenRecorderTempDirectory);
-    EXPECT_EQ(TXScreenRecorderRequiredFreeSpace, 100000000u);
-}
-
 TEST(FileManagerSetup, CreatesTheDirectoryAndLeavesAnythingAlreadyThere) {
     testing_support::MobileRoot root;
     root.makeLibrary(false);
@@ -65,61 +59,47 @@ TEST(FileManagerSetup, FailureGoesToTheConsoleAndThenTheErrorLog) {
     EXPECT_FALSE(QFileInfo::exists(root.hostPath("Library")));
 }
 
-TEST_F(FileManagerFixture, PurgeRemovesOnlyEntriesOlderThanTheTimeToLive) {
-    addFile("old.mp4", 1000, 200);
-    addFile("exactly.mp4", 2000, 100);
-    addFile("young.mp4", 4000, 50);
-
-    EXPECT_EQ(manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(100), 1000);
-
-    EXPECT_FALSE(exists("old.mp4"));
-    EXPECT_TRUE(exists("exactly.mp4")) << "an age equal to the time to live is kept";
-    EXPECT_TRUE(exists("young.mp4"));
-    EXPECT_EQ(logs.texts(), (QStringList{"_srDeleteFilesOlderThanTimeToLiveInSeconds: 100",
-                                         "deleting old file"}));
-}
-
-TEST_F(FileManagerFixture, ZeroAndNegativeTimeToLiveRemoveEverythingAndNaNNothing) {
-    struct Case {
+// Entries older than the time to live go, one exactly as old stays; zero and
+// negative times remove everything, even what was made now, and NaN
+// nothing; the time is logged clamped to 32 bits.
+TEST_F(FileManagerFixture, PurgeRemovesEntriesOlderThanTheTimeToLive) {
+    const QStringList all = {"exactly.mp4", "now.mp4", "old.mp4"};
+    const struct {
         double timeToLive;
-        qint64 removed;
         QString logged;
+        QStringList kept;
+    } cases[] = {
+        {100, "100", {"exactly.mp4", "now.mp4"}},
+        {0, "0", {}},
+        {-3.9, "-3", {}},
+        {-1e12, "-2147483648", {}},
+        {1e12, "2147483647", all},
+        {std::numeric_limits<double>::quiet_NaN(), "0", all},
     };
-    const Case cases[] = {
-        {0.0, 60, "0"},
-        {-1.0, 60, "-1"},
-        {-3.9, 60, "-3"},
-        {std::numeric_limits<double>::quiet_NaN(), 0, "0"},
-    };
-    for (const Case& c : cases) {
+    for (const auto& c : cases) {
         SCOPED_TRACE(c.timeToLive);
-        addFile("a.mp4", 10, 0); // made "now": only the special values remove it
-        addFile("b.mov", 20, 1);
-        addFile("c", 30, 2);
+        addFile("old.mp4", 1000, 200);
+        addFile("exactly.mp4", 2000, 100);
+        addFile("now.mp4", 4000, 0);
         logs.clear();
+        qint64 removed = 0;
+        for (const QString& name : all)
+            removed += c.kept.contains(name) ? 0 : QFileInfo(tempHost(name)).size();
 
-        EXPECT_EQ(manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(c.timeToLive), c.removed);
+        EXPECT_EQ(manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(c.timeToLive), removed);
+        EXPECT_EQ(QDir(tempHost()).entryList(QDir::Files), c.kept);
         EXPECT_EQ(logs.texts().first(), "_srDeleteFilesOlderThanTimeToLiveInSeconds: " + c.logged);
-        EXPECT_EQ(QDir(tempHost()).entryList(QDir::Files).size(), c.removed ? 0 : 3);
+        EXPECT_EQ(logs.count("deleting old file"), all.size() - c.kept.size());
+        EXPECT_EQ(logs.texts().size(), 1 + all.size() - c.kept.size());
         QDir(tempHost()).removeRecursively();
         root.makeLibrary();
     }
-}
-
-TEST_F(FileManagerFixture, DeleteAllTempFilesIsThePurgeWithZeroTimeToLive) {
-    addFile("a.mp4", 7, 0);
-    QDir().mkpath(tempHost("folder/inner")); // entries are treated alike, folders too
-    EXPECT_GE(manager->_srDeleteAllTempFiles(), 7);
+    // Folders are entries alike: deleting every file is the purge with zero.
+    QDir().mkpath(tempHost("folder/inner"));
+    logs.clear();
+    manager->_srDeleteAllTempFiles();
     EXPECT_TRUE(QDir(tempHost()).isEmpty());
     EXPECT_EQ(logs.texts().first(), "_srDeleteFilesOlderThanTimeToLiveInSeconds: 0");
-}
-
-TEST_F(FileManagerFixture, PurgeTimeToLiveIsLoggedClampedTo32Bits) {
-    manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(1e12);
-    manager->_srDeleteFilesOlderThanTimeToLiveInSeconds(-1e12);
-    EXPECT_EQ(logs.texts(),
-              (QStringList{"_srDeleteFilesOlderThanTimeToLiveInSeconds: 2147483647",
-                           "_srDeleteFilesOlderThanTimeToLiveInSeconds: -2147483648"}));
 }
 
 TEST_F(FileManagerFixture, PurgeCarriesTheFirstFailureToTheEnd) {

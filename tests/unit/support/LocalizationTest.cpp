@@ -44,31 +44,35 @@ void writeText(const QString& path, const QByteArray& text) {
 
 } // namespace
 
-TEST(FrameworkStrings, ARegionFallsBackToItsPlainLanguage) {
+// A region falls back to its plain language; without languages or a match
+// the framework's own lookup decides, which walks the rest of the list
+// after the first preferred language, tried by name. The photo framework's
+// tables are searched in order (the title format is only in the last).
+TEST(FrameworkStrings, AreLookedUpInTheUsersLanguage) {
+    const struct {
+        const char *lang, *language, *key, *expected;
+        bool photos;
+    } cases[] = {
+        {"de_AT.UTF-8", nullptr, "DONE", "Fertig", false},
+        {"C", nullptr, "SAVE", "Save", false},
+        {"C", nullptr, "NO_SUCH_KEY", "NO_SUCH_KEY", false},
+        {"it_IT.UTF-8", "it:ja", "CANCEL", "キャンセル", false},
+        {"de_DE.UTF-8", nullptr, "NO_SUCH_KEY", "NO_SUCH_KEY", false},
+        {"de_DE.UTF-8", nullptr, "CLOSE", "Schließen", true},
+        {"de_DE.UTF-8", nullptr, "VIEW_BUTTON_TITLE_FORMAT", "Auf %@ ansehen", true},
+        {"de_DE.UTF-8", nullptr, "NOT_A_KEY", "NOT_A_KEY", true},
+    };
+    for (const auto& c : cases) {
+        Languages env(c.lang, c.language);
+        EXPECT_EQ(c.photos ? TXLocalizedFrameworkString(c.key) : localized(c.key),
+                  QString::fromUtf8(c.expected))
+            << c.lang << " " << c.key;
+    }
     Languages env("de_AT.UTF-8");
-    EXPECT_EQ(localized("DONE"), QStringLiteral("Fertig"));
     EXPECT_EQ(BundleTXExtensions::_txLocalizedStringFromFrameworkBundleWithKey_bundleID(
                   "DONE", "any.other.id"),
               QStringLiteral("Fertig"))
         << "the bundle identifier does not change the text";
-}
-
-TEST(FrameworkStrings, WithoutLanguagesOrAMatchTheFrameworksOwnLookupDecides) {
-    {
-        Languages env("C");
-        EXPECT_EQ(localized("SAVE"), QStringLiteral("Save"));
-        EXPECT_EQ(localized("NO_SUCH_KEY"), QStringLiteral("NO_SUCH_KEY"));
-    }
-    {
-        // Only the first preferred language is tried by name; the framework's
-        // own lookup then walks the rest of the list.
-        Languages env("it_IT.UTF-8", "it:ja");
-        EXPECT_EQ(localized("CANCEL"), QStringLiteral("キャンセル"));
-    }
-    {
-        Languages env("de_DE.UTF-8");
-        EXPECT_EQ(localized("NO_SUCH_KEY"), QStringLiteral("NO_SUCH_KEY"));
-    }
 }
 
 TEST(FrameworkStrings, EveryShippedLanguageHasEveryKey) {
@@ -97,17 +101,6 @@ TEST(FrameworkStrings, EveryShippedLanguageHasEveryKey) {
     }
 }
 
-TEST(FrameworkStrings, PhotoFrameworkTablesAreSearchedInOrder) {
-    Languages env("de_DE.UTF-8");
-    EXPECT_EQ(TXLocalizedFrameworkString("CLOSE"), QStringLiteral("Schließen"));
-    // Found only in the last table.
-    EXPECT_EQ(TXLocalizedFrameworkString("VIEW_BUTTON_TITLE_FORMAT"),
-              QStringLiteral("Auf %@ ansehen"));
-    EXPECT_EQ(TXLocalizedFrameworkString("NOT_A_KEY"), QStringLiteral("NOT_A_KEY"));
-    EXPECT_EQ(TXQuillonFrameworkBundle(), TXQuillonFrameworkBundle());
-    EXPECT_EQ(BundleTXExtensions::_txFrameworkBundle(), BundleTXExtensions::_txFrameworkBundle());
-}
-
 TEST(AppNames, DisplayNameComesFromTheInstalledDesktopEntryInTheUsersLanguage) {
     QTemporaryDir home, dirs;
     ScopedEnv env("XDG_DATA_HOME", home.path().toLocal8Bit());
@@ -118,20 +111,13 @@ TEST(AppNames, DisplayNameComesFromTheInstalledDesktopEntryInTheUsersLanguage) {
     writeText(dirs.path() + "/applications/org.example.Nameless.desktop",
               "[Desktop Entry]\nType=Application\n");
 
-    {
-        Languages lang("de_AT.UTF-8");
+    for (const auto& [lang, name] :
+         {std::pair{"de_AT.UTF-8", "Rennwagen"}, std::pair{"fr_CA.UTF-8", "Bolide"},
+          std::pair{"es_ES.UTF-8", "Racer"}}) {
+        Languages env(lang);
         EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"),
-                  QStringLiteral("Rennwagen"));
-    }
-    {
-        Languages lang("fr_CA.UTF-8");
-        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"),
-                  QStringLiteral("Bolide"));
-    }
-    {
-        Languages lang("es_ES.UTF-8");
-        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Racer"),
-                  QStringLiteral("Racer"));
+                  QString(name))
+            << lang;
     }
     const auto nameless =
         BundleTXExtensions::_txLocalizedAppNameFromBundleID("org.example.Nameless");
@@ -155,13 +141,10 @@ TEST(AppNames, BundleNameEntriesAreTriedInOrder) {
     writeText(named + "/Info.json", R"({"BundleName": "Short", "BundleDisplayName": "Long Name"})");
     writeText(named + "/de.lproj/InfoPlist.strings", R"("BundleDisplayName" = "Langer Name";)");
     bundle = platform::Bundle::bundleWithPath(named);
-    {
-        Languages lang("de_DE.UTF-8");
-        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppName(*bundle), QStringLiteral("Langer Name"));
-    }
-    {
-        Languages lang("C");
-        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppName(*bundle), QStringLiteral("Long Name"));
+    for (const auto& [lang, name] :
+         {std::pair{"de_DE.UTF-8", "Langer Name"}, std::pair{"C", "Long Name"}}) {
+        Languages env(lang);
+        EXPECT_EQ(BundleTXExtensions::_txLocalizedAppName(*bundle), QString(name)) << lang;
     }
     const QString shortOnly = dir.path() + "/Short.bundle";
     writeText(shortOnly + "/Info.json", R"({"BundleName": "Short"})");

@@ -15,15 +15,12 @@
 #include <cstring>
 #include <fcntl.h>
 #include <linux/fs.h>
-#include <mutex>
 #include <sys/ioctl.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
 namespace platform {
 namespace {
-
-std::mutex lastSavedMutex;
 
 const QString kDomain = QStringLiteral("PhotoAlbum");
 
@@ -140,11 +137,6 @@ std::shared_ptr<FolderPhotoAlbum> FolderPhotoAlbum::inUsersVideos() {
 
 FolderPhotoAlbum::FolderPhotoAlbum(QString folderHostPath) : folder_(std::move(folderHostPath)) {}
 
-QString FolderPhotoAlbum::lastSavedPath() const {
-    std::lock_guard lock(lastSavedMutex);
-    return *lastSaved_;
-}
-
 QString FolderPhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error,
                                       std::shared_ptr<void> hold) {
     const QString source = DevicePaths::toHost(devicePath);
@@ -173,12 +165,7 @@ QString FolderPhotoAlbum::importVideo(const QString& devicePath, ErrorPtr* error
     Descriptor dir;
     dir.fd = ::open(folder.constData(), O_RDONLY | O_DIRECTORY | O_CLOEXEC);
     const QFileInfo sourceInfo(source);
-    auto named = [&](const QString& name) {
-        const QString saved = folder_ + QLatin1Char('/') + name;
-        std::lock_guard lock(lastSavedMutex);
-        *lastSaved_ = saved;
-        return saved;
-    };
+    auto named = [&](const QString& name) { return folder_ + QLatin1Char('/') + name; };
     // The copy is written as an unnamed file in the album folder and given a
     // name only when whole, so the album never shows a partial file.
     Descriptor out;

@@ -22,8 +22,6 @@ class FolderPhotoAlbum final : public PhotoAlbum {
 
     const QString& folder() const { return folder_; }
 
-    // On success the new file's host path is available through
-    // lastSavedPath().
     void performChanges_creationRequestForAssetFromVideoAtFileURL(const QUrl& fileURL,
                                                                   Completion completion) override;
     void saveVideoAtPathToAlbum(const QString& path) override;
@@ -36,11 +34,8 @@ class FolderPhotoAlbum final : public PhotoAlbum {
     QString importVideo(const QString& devicePath, ErrorPtr* error,
                         std::shared_ptr<void> hold = nullptr);
 
-    QString lastSavedPath() const;
-
   private:
     QString folder_;
-    mutable std::shared_ptr<QString> lastSaved_ = std::make_shared<QString>();
 };
 
 } // namespace platform
