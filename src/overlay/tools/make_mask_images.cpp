@@ -8,12 +8,11 @@
 // TXVideoOverlayGlyphMask: the play triangle, opaque black on transparent,
 // the same size as the background mask. Both are 80 x 80 points.
 
-#include <QDir>
-#include <QGuiApplication>
 #include <QImage>
 #include <QPainter>
 #include <QPainterPath>
-#include <cstdio>
+
+#include "platform/ui/tools/ImageSetTool.h"
 
 namespace {
 
@@ -54,35 +53,11 @@ QImage glyphMask(int scale) {
     return image;
 }
 
-bool save(const QImage& image, const QString& directory, const QString& name, int scale) {
-    const QString file = directory + QLatin1Char('/') + name +
-                         (scale == 1 ? QString() : QStringLiteral("@%1x").arg(scale)) +
-                         QStringLiteral(".png");
-    if (!image.save(file, "PNG")) {
-        std::fprintf(stderr, "cannot write %s\n", qPrintable(file));
-        return false;
-    }
-    return true;
-}
-
 } // namespace
 
 int main(int argc, char** argv) {
-    QGuiApplication app(argc, argv);
-    if (argc != 2) {
-        std::fprintf(stderr, "usage: %s FRAMEWORK_DIRECTORY\n", argv[0]);
-        return 2;
-    }
-    const QString directory = QString::fromLocal8Bit(argv[1]);
-    if (!QDir().mkpath(directory)) {
-        std::fprintf(stderr, "cannot create %s\n", argv[1]);
-        return 1;
-    }
-    for (int scale = 1; scale <= 3; ++scale) {
-        if (!save(backgroundMask(scale), directory, QStringLiteral("TXVideoOverlayBackgroundMask"),
-                  scale) ||
-            !save(glyphMask(scale), directory, QStringLiteral("TXVideoOverlayGlyphMask"), scale))
-            return 1;
-    }
-    return 0;
+    return platform::tools::drawImageSet(
+        argc, argv,
+        {{QStringLiteral("TXVideoOverlayBackgroundMask"), backgroundMask},
+         {QStringLiteral("TXVideoOverlayGlyphMask"), glyphMask}});
 }

@@ -6,12 +6,11 @@
 // PublishVideoActivity: a monitor playing a recording, an arrow rising beside it, opaque black
 // on transparent (the sheet tints it), 48 x 48 points.
 
-#include <QDir>
-#include <QGuiApplication>
 #include <QImage>
 #include <QPainter>
 #include <QPainterPath>
-#include <cstdio>
+
+#include "platform/ui/tools/ImageSetTool.h"
 
 namespace {
 
@@ -50,32 +49,9 @@ QImage icon(int scale) {
     return image;
 }
 
-bool save(const QImage& image, const QString& directory, const QString& name, int scale) {
-    const QString file = directory + QLatin1Char('/') + name +
-                         (scale == 1 ? QString() : QStringLiteral("@%1x").arg(scale)) +
-                         QStringLiteral(".png");
-    if (!image.save(file, "PNG")) {
-        std::fprintf(stderr, "cannot write %s\n", qPrintable(file));
-        return false;
-    }
-    return true;
-}
-
 } // namespace
 
 int main(int argc, char** argv) {
-    QGuiApplication app(argc, argv);
-    if (argc != 2) {
-        std::fprintf(stderr, "usage: %s FRAMEWORK_DIRECTORY\n", argv[0]);
-        return 2;
-    }
-    const QString directory = QString::fromLocal8Bit(argv[1]);
-    if (!QDir().mkpath(directory)) {
-        std::fprintf(stderr, "cannot create %s\n", argv[1]);
-        return 1;
-    }
-    for (int scale = 1; scale <= 3; ++scale)
-        if (!save(icon(scale), directory, QStringLiteral("PublishVideoActivity"), scale))
-            return 1;
-    return 0;
+    return platform::tools::drawImageSet(argc, argv,
+                                         {{QStringLiteral("PublishVideoActivity"), icon}});
 }
