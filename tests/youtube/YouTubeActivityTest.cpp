@@ -93,7 +93,7 @@ class ActivityFixture : public ::testing::Test {
 
 } // namespace
 
-TEST_F(ActivityFixture, IdentityIsFixedAndTheDeviceDecidesWhetherItCanPerform) {
+TEST_F(ActivityFixture, IdentityAndUploadFileAreFixedAndTheDeviceDecidesWhetherItCanPerform) {
     EXPECT_EQ(activity->activityType(), "TXPublishToYouTube");
     EXPECT_EQ(activity->activityTitle(), "YouTube");
     EXPECT_EQ(activity->activityCategory(), ActivityCategory::Share);
@@ -104,9 +104,8 @@ TEST_F(ActivityFixture, IdentityIsFixedAndTheDeviceDecidesWhetherItCanPerform) {
     }
     EXPECT_EQ(activity->activityImage().deviceIndependentSize(), QSizeF(48, 48));
     EXPECT_EQ(activity->_activitySettingsImage().deviceIndependentSize(), QSizeF(29, 29));
-}
 
-TEST_F(ActivityFixture, TheUploadFileIsNamedByTheSecondInTheTemporaryDirectory) {
+    // The upload file is named by the second, in the temporary directory.
     const qint64 before = QDateTime::currentSecsSinceEpoch();
     const QUrl url = activity->tempFileURL();
     const auto match =
