@@ -14,7 +14,7 @@ tamsel_add_tests(tamsel_store_tests unit
   LIBS tamsel_share_test_support tamsel_youtube)
 
 tamsel_add_tests(tamsel_share_sheet_tests unit
-  SOURCES share/ActivitySheetTest.cpp share/BuiltInActivitiesTest.cpp share/ShareStringsTest.cpp
+  SOURCES share/ActivitySheetTest.cpp share/BuiltInActivitiesTest.cpp
     share/DesktopServiceFakesTest.cpp
   LIBS tamsel_share_test_support Qt6::Test
   MAIN tamsel_ui_test_main)

@@ -85,7 +85,8 @@ TEST_F(SignInTest, SignsInThroughTheBrowserWithPkceALoopbackRedirectAndTheUpload
         PublishingError::is(restore(afterSignOut).value_or(nullptr), PublishingError::NotSignedIn));
 }
 
-// Each way signing in can fail ends it, with the reason, instead of waiting.
+// Each way signing in can fail ends it, with the reason, instead of waiting;
+// the last, a missing OAuth client, is then configured in a file.
 TEST_F(SignInTest, AFailedSignInEndsWithItsReason) {
     QTemporaryDir config;
     const struct {
@@ -128,16 +129,11 @@ TEST_F(SignInTest, AFailedSignInEndsWithItsReason) {
         EXPECT_EQ(browser.opened().isEmpty(), c.code == PublishingError::NotConfigured);
     }
     EXPECT_EQ(server_.record().codeExchanges, 0);
-}
 
-TEST_F(SignInTest, TheOAuthClientCanComeFromTheUsersConfigurationFile) {
-    QTemporaryDir config;
+    // The client, missing so far, now comes from the user's configuration file.
     writeText(config.filePath("tamsel/youtube.conf"),
               "[oauth]\nclient_id = tamsel-test.apps.example\n"
               "client_secret = tamsel-test-secret\n");
-    env_.unset("TAMSEL_YOUTUBE_CLIENT_ID");
-    env_.unset("TAMSEL_YOUTUBE_CLIENT_SECRET");
-    env_.set("XDG_CONFIG_HOME", config.path().toUtf8());
     FakeBrowser browser(FakeBrowser::Behaviour::Follow);
     YouTubeGoogleSignIn google;
     EXPECT_EQ(signIn(google), std::optional<ErrorPtr>(nullptr));

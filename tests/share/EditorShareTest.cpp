@@ -129,11 +129,15 @@ TEST_F(EditorShareTest, SharesTheStoreTextTheLinkAndTheRecordingAsReceived) {
         sheet->activityItems(),
         (QVariantList{QStringLiteral("Check out my recording of Racer by Example Games!"),
                       QStringLiteral("https://store.example/apps/org.example.Racer"), recording}));
-    EXPECT_EQ(log.count("displayShareSheetWithVideoURL"), 1);
-    EXPECT_EQ(store->requests.size(), 1);
-    EXPECT_TRUE(sheet->hasCompletionWithItemsHandler());
     EXPECT_EQ(sheet->modalPresentationStyle(), ViewController::ModalPresentationStyle::Popover);
     EXPECT_EQ(sheet->popoverItem(), editor->shareButton);
+
+    // On a tablet in intro mode the toolbar has no play button; done leads.
+    ASSERT_TRUE(editor->isIntroMode());
+    EXPECT_EQ(top(), "done | title | - share - save");
+    editor->setIntroMode(false);
+    ASSERT_TRUE(share());
+    EXPECT_EQ(top(), "done | title | play - share - save");
 }
 
 TEST_F(EditorShareTest, CompletedActivitiesAreRecordedEachTimeAndOthersNot) {
@@ -148,17 +152,6 @@ TEST_F(EditorShareTest, CompletedActivitiesAreRecordedEachTimeAndOthersNot) {
 
     editor->doneAction();
     EXPECT_EQ(delegate->reports, (QList<QStringList>{{MailActivityType, MailActivityType}}));
-}
-
-TEST_F(EditorShareTest, OnATabletInIntroModeTheToolbarHasNoPlayButtonAndDoneLeads) {
-    show();
-    ASSERT_TRUE(editor->isPadMode());
-    ASSERT_TRUE(editor->isIntroMode());
-    ASSERT_TRUE(share());
-    EXPECT_EQ(top(), "done | title | - share - save");
-    editor->setIntroMode(false);
-    ASSERT_TRUE(share());
-    EXPECT_EQ(top(), "done | title | play - share - save");
 }
 
 TEST_F(EditorShareTest, OnAPhoneTheSheetFillsTheWindow) {

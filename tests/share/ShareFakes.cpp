@@ -63,7 +63,7 @@ void FakeActivity::prepareWithActivityItems(const QVariantList& items) {
 
 std::shared_ptr<ViewController> FakeActivity::activityViewController() {
     calls << QStringLiteral("activityViewController");
-    return controller;
+    return nullptr;
 }
 
 void FakeActivity::performActivity() {

@@ -82,7 +82,6 @@ class FakeActivity final : public platform::Activity {
     QString type, title;
     bool canPerform;
     std::optional<bool> completesWith = true;
-    std::shared_ptr<platform::ViewController> controller;
     QVariantList askedItems;
     QStringList calls;
 };

@@ -21,10 +21,8 @@
 #include <QDateTime>
 #include <QFile>
 #include <QLineEdit>
-#include <QProcess>
 #include <QPushButton>
 #include <QRegularExpression>
-#include <QStandardPaths>
 #include <QTest>
 #include <gtest/gtest.h>
 
@@ -81,9 +79,11 @@ class ActivityFixture : public ::testing::Test {
     InPlace<PublishingPluginLoader, FakePluginLoader> loader;
     FakeBrowser browser;
     LogCapture log;
+    // A desktop and a microphone track, as recorders write them.
     QString moviePath = mediatest::movieFor([] {
         testmedia::MovieSpec shape;
         shape.seconds = 1;
+        shape.audioTracks = 2;
         return shape;
     }());
     std::shared_ptr<TXYouTubeActivity> activity = TXYouTubeActivity::init();
@@ -93,7 +93,7 @@ class ActivityFixture : public ::testing::Test {
 
 } // namespace
 
-TEST_F(ActivityFixture, IdentityIsFixedAndTheDeviceDecidesWhetherItCanPerform) {
+TEST_F(ActivityFixture, IdentityAndUploadFileAreFixedAndTheDeviceDecidesWhetherItCanPerform) {
     EXPECT_EQ(activity->activityType(), "TXPublishToYouTube");
     EXPECT_EQ(activity->activityTitle(), "YouTube");
     EXPECT_EQ(activity->activityCategory(), ActivityCategory::Share);
@@ -104,9 +104,8 @@ TEST_F(ActivityFixture, IdentityIsFixedAndTheDeviceDecidesWhetherItCanPerform) {
     }
     EXPECT_EQ(activity->activityImage().deviceIndependentSize(), QSizeF(48, 48));
     EXPECT_EQ(activity->_activitySettingsImage().deviceIndependentSize(), QSizeF(29, 29));
-}
 
-TEST_F(ActivityFixture, TheUploadFileIsNamedByTheSecondInTheTemporaryDirectory) {
+    // The upload file is named by the second, in the temporary directory.
     const qint64 before = QDateTime::currentSecsSinceEpoch();
     const QUrl url = activity->tempFileURL();
     const auto match =
@@ -120,20 +119,13 @@ TEST_F(ActivityFixture, TheUploadFileIsNamedByTheSecondInTheTemporaryDirectory) 
 }
 
 TEST_F(ActivityFixture, PreparingExportsAtHighestQualityWithEveryAudioTrackAndComposesTheText) {
-    // The movie with its audio track twice, as a recorder writes a desktop
-    // and a microphone track.
-    const QString movie = mediatest::scratchPath(QStringLiteral("two-audio-tracks.mp4"));
-    if (QStandardPaths::findExecutable("ffmpeg").isEmpty() ||
-        QProcess::execute("ffmpeg", {"-y", "-v", "error", "-i", moviePath, "-i", moviePath, "-map",
-                                     "0:v", "-map", "0:a", "-map", "1:a", "-c", "copy", movie}))
-        GTEST_SKIP() << "ffmpeg is needed to make a movie with two audio tracks";
     activity->prepareWithActivityItems({QStringLiteral("T"),
                                         QUrl(QStringLiteral("https://example.org/L?a=1")),
-                                        QUrl::fromLocalFile(movie)});
+                                        QUrl::fromLocalFile(moviePath)});
     EXPECT_EQ(activity->descriptionText, "T https://example.org/L?a=1");
     ASSERT_EQ(exports.made.size(), 1);
     const auto& session = *exports.made[0];
-    EXPECT_EQ(session.asset()->hostPath(), movie);
+    EXPECT_EQ(session.asset()->hostPath(), moviePath);
     EXPECT_EQ(session.presetName(), ExportPresetHighestQuality);
     EXPECT_EQ(session.outputURL(), activity->movieURL);
     EXPECT_TRUE(activity->movieURL.path().contains("/Tamsel//TXCapture_YouTube"));
@@ -183,7 +175,7 @@ TEST_F(ActivityFixture, TheControllerIsTheAgentsStackWithTheDescriptionFilledIn)
     EXPECT_EQ(controller, agent->navigationController());
     EXPECT_EQ(agent->delegate().get(), static_cast<TXPublishingAgentDelegate*>(activity.get()));
     EXPECT_EQ(agent->mediaPath, activity->movieURL.path());
-    const FakeFormMembers& table = form()->members_;
+    const FakeUploadForm& table = *form();
     EXPECT_EQ(table.description.value, "Check out my recording of Racer by Example Games! "
                                        "https://flathub.org/apps/org.example.Racer");
     EXPECT_EQ(table.description.placeholder, "");
@@ -207,12 +199,12 @@ TEST_F(ActivityFixture, TheCategoryWithIdentifierTwentyIsPreselectedUntilTheNext
     pick();
     FakeUploadForm* first = form();
     first->categoriesDidArrive({"10:Music", "20:Gaming", "22:People & Blogs"});
-    EXPECT_EQ(first->members_.calls, (QStringList{"category Gaming", "select 1 0 0"}));
+    EXPECT_EQ(first->calls, (QStringList{"category Gaming", "select 1 0 0"}));
     EXPECT_EQ(first->defaultCategory, "20");
     // Without the category, or without any, the form is left as it was.
     first->categoriesDidArrive({"1:Film", "2:Autos"});
     first->categoriesDidArrive({});
-    EXPECT_EQ(first->members_.calls.size(), 2);
+    EXPECT_EQ(first->calls.size(), 2);
     EXPECT_EQ(first->defaultCategory, "20");
     EXPECT_EQ(first->ownSelections, 0);
 
@@ -220,15 +212,15 @@ TEST_F(ActivityFixture, TheCategoryWithIdentifierTwentyIsPreselectedUntilTheNext
     activity->activityViewController();
     first->categoriesDidArrive({"10:Music", "20:Gaming"});
     EXPECT_EQ(first->ownSelections, 1) << "the second request swapped the form's own back";
-    EXPECT_EQ(first->members_.calls.size(), 2);
+    EXPECT_EQ(first->calls.size(), 2);
 
     // A form without its members is neither filled nor preselected, but shown.
     EXPECT_TRUE(activity->activityViewController());
     form()->categoriesDidArrive({"20:Gaming"});
     EXPECT_EQ(form()->ownSelections, 0);
-    EXPECT_EQ(form()->members_.description.value, "");
-    EXPECT_EQ(form()->members_.description.placeholder, "Description");
-    EXPECT_TRUE(form()->members_.calls.isEmpty());
+    EXPECT_EQ(form()->description.value, "");
+    EXPECT_EQ(form()->description.placeholder, "Description");
+    EXPECT_TRUE(form()->calls.isEmpty());
 }
 
 // A device without the plug-in, or with one that lacks the agent class,

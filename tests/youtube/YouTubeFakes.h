@@ -95,11 +95,22 @@ class FakeFormCell : public QObject {
     QString value, placeholder;
 };
 
-// The form's table (section 0: the title, then the description), its
-// category picker and cell, each recording the calls it gets.
-class FakeFormMembers : public QObject {
+// The upload form, which is also its own table (section 0: the title, then
+// the description), category picker and cell, recording the calls these get;
+// made with `hasMembers` false, it has none of them. Its own
+// "_selectComedyPickerRow" (in MethodTable, under this class) only counts its
+// runs; categoriesDidArrive runs whatever the class's entry holds, as the
+// real form does when the categories come in.
+class FakeUploadForm : public platform::ViewController {
     Q_OBJECT
+    Q_PROPERTY(QObject* _table READ members)
+    Q_PROPERTY(QVariantList _categories MEMBER categories)
+    Q_PROPERTY(QObject* _picker READ members)
+    Q_PROPERTY(QString _defaultCategory MEMBER defaultCategory)
   public:
+    explicit FakeUploadForm(bool hasMembers = true);
+    QObject* members() { return hasMembers_ ? this : nullptr; }
+    Q_INVOKABLE QObject* _categoryCell() { return members(); }
     Q_INVOKABLE QObject* cellForRowAtIndexPath(int section, int row) {
         return section != 0 ? nullptr : row == 0 ? &title : row == 1 ? &description : nullptr;
     }
@@ -109,28 +120,11 @@ class FakeFormMembers : public QObject {
     Q_INVOKABLE void setCategoryString(const QString& category) {
         calls << QStringLiteral("category ") + category;
     }
-    FakeFormCell title{QStringLiteral("Title")}, description{QStringLiteral("Description")};
-    QStringList calls;
-};
-
-// The upload form. Its own "_selectComedyPickerRow" (in MethodTable, under
-// this class) only counts its runs; categoriesDidArrive runs whatever the
-// class's entry holds, as the real form does when the categories come in.
-// A form made with `members` false has none of the members.
-class FakeUploadForm : public platform::ViewController {
-    Q_OBJECT
-    Q_PROPERTY(QObject* _table READ members)
-    Q_PROPERTY(QVariantList _categories MEMBER categories)
-    Q_PROPERTY(QObject* _picker READ members)
-    Q_PROPERTY(QString _defaultCategory MEMBER defaultCategory)
-  public:
-    explicit FakeUploadForm(bool hasMembers = true);
-    Q_INVOKABLE QObject* _categoryCell() { return members(); }
-    QObject* members() { return hasMembers_ ? &members_ : nullptr; }
     // The categories arrive: [{"id", "label"}] from "id:label" texts.
     void categoriesDidArrive(const QStringList& list);
 
-    FakeFormMembers members_;
+    FakeFormCell title{QStringLiteral("Title")}, description{QStringLiteral("Description")};
+    QStringList calls;
     QVariantList categories;
     QString defaultCategory = QStringLiteral("22");
     int ownSelections = 0;

@@ -55,7 +55,6 @@ class ActivityViewController : public ViewController {
     void setCompletionWithItemsHandler(CompletionWithItemsHandler handler) {
         completion_ = std::move(handler);
     }
-    bool hasCompletionWithItemsHandler() const { return bool(completion_); }
 
     // What the sheet offers now, in the order shown.
     virtual ActivityList offeredActivities() = 0;
