@@ -1,5 +1,6 @@
 // The product as a host uses it: tamsel-edit, the extension process, the
-// editor driven by automation, the album and the temporary directory.
+// editor driven by automation, the album and the temporary directory. The
+// typical use by pointer is RepeatedUse's.
 
 #include "EndToEndFixture.h"
 #include "MediaGenerator.h"
@@ -20,80 +21,6 @@ QStringList names(const QJsonValue& array) {
 }
 
 } // namespace
-
-TEST_F(EndToEnd, TheTypicalUse) {
-    const QByteArray original = hashOf(recording());
-    const Run run = edit(R"(
-wait ready
-dump
-tap videoOverlayPlayButton
-wait playing
-wait paused 60
-dump
-drag end 4
-dump
-tap playButton
-wait playing
-wait paused 30
-dump
-tap videoOverlay
-sleep 0.3
-tap trimButton
-wait exporting=false 60
-dump
-tap doneButton
-)");
-    ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
-    ASSERT_EQ(run.dumps.size(), 5) << run.out.toStdString();
-
-    const QJsonObject intro = run.dumps[0];
-    EXPECT_TRUE(intro["introMode"].toBool());
-    EXPECT_FALSE(intro["hasEdit"].toBool());
-    EXPECT_DOUBLE_EQ(intro["editStartTime"].toDouble(), 0.0);
-    EXPECT_NEAR(intro["editEndTime"].toDouble(), 10.0, 0.1);
-
-    const QJsonObject ended = run.dumps[1];
-    EXPECT_FALSE(ended["introMode"].toBool()) << "the first play ends intro mode";
-    EXPECT_FALSE(ended["uiHidden"].toBool()) << "the chrome comes back at the end";
-    EXPECT_NEAR(ended["currentTime"].toDouble(), 0.0, 0.05) << "and the playhead goes back to zero";
-
-    const QJsonObject trimming = run.dumps[2];
-    EXPECT_TRUE(trimming["trimming"].toBool());
-    EXPECT_TRUE(trimming["hasEdit"].toBool());
-    EXPECT_NEAR(trimming["editEndTime"].toDouble(), 4.0, 0.1);
-    EXPECT_TRUE(names(trimming["topToolBar"]).contains("trimButton"));
-    EXPECT_FALSE(names(trimming["topToolBar"]).contains("saveButton"));
-
-    const QJsonObject playedRange = run.dumps[3];
-    EXPECT_NEAR(playedRange["currentTime"].toDouble(), trimming["editEndTime"].toDouble(), 0.2)
-        << "the range plays from the start handle and stops at the end handle";
-
-    const QJsonObject saved = run.dumps[4];
-    EXPECT_FALSE(saved["exporting"].toBool());
-    EXPECT_FALSE(saved["trimming"].toBool()) << "the player switched to the trimmed clip";
-    EXPECT_TRUE(
-        saved["videoURL"].toString().startsWith("/private/var/mobile/Library/Tamsel//Racer_"));
-    EXPECT_TRUE(names(saved["topToolBar"]).contains("doneButton"));
-
-    EXPECT_EQ(run.hostReport, kSavedToAlbumReport);
-    EXPECT_EQ(hashOf(recording()), original) << "the host's movie is never modified";
-    EXPECT_TRUE(tempFiles().isEmpty()) << tempFiles().join(", ").toStdString();
-
-    ASSERT_EQ(albumFiles().size(), 1);
-    expectWholeClipsOnly(trimming["editEndTime"].toDouble());
-}
-
-TEST_F(EndToEnd, ShakeUndoesATrimAndCancelThenReadsDone) {
-    const Run run = edit("wait ready\ndrag start 2\ndump\nshake\ndump\ntap doneButton\n");
-    ASSERT_EQ(run.exitCode, 0) << run.err.toStdString();
-    ASSERT_EQ(run.dumps.size(), 2);
-    EXPECT_TRUE(run.dumps[0]["trimming"].toBool());
-    EXPECT_NEAR(run.dumps[0]["editStartTime"].toDouble(), 2.0, 0.1);
-    EXPECT_FALSE(run.dumps[1]["trimming"].toBool());
-    EXPECT_NEAR(run.dumps[1]["editStartTime"].toDouble(), 2.0, 0.1) << "cancelling keeps the range";
-    EXPECT_EQ(names(run.dumps[1]["topToolBar"]).first(), "doneButton");
-    EXPECT_EQ(run.hostReport, "[]");
-}
 
 TEST_F(EndToEnd, TheKeyboardAlonePlaysTrimsSavesAndReachesEveryControl) {
     QString script = R"(

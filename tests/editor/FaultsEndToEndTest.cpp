@@ -12,6 +12,7 @@
 #include <QFile>
 #include <QProcess>
 #include <QStorageInfo>
+#include <QtEndian>
 #include <csignal>
 #include <sys/stat.h>
 
@@ -30,17 +31,12 @@ QProcessEnvironment loggingToStderr() {
 // A recording made longer by a free box of `padding` bytes at its end, which
 // players skip: a large file that is quick to make.
 bool writeLargeRecording(const QString& path, const QString& from, qint64 padding) {
-    if (!QFile::copy(from, path))
-        return false;
     QFile file(path);
-    if (!file.open(QIODevice::Append))
+    if (!QFile::copy(from, path) || !file.open(QIODevice::Append))
         return false;
-    QByteArray header(8, '\0');
-    const quint32 size = quint32(padding);
-    for (int i = 0; i < 4; ++i)
-        header[i] = char(size >> (24 - 8 * i));
-    header.replace(4, 4, "free");
-    file.write(header);
+    QByteArray header(4, '\0');
+    qToBigEndian(quint32(padding), header.data());
+    file.write(header + "free");
     const QByteArray block(1 << 20, '\0');
     for (qint64 left = padding - 8; left > 0; left -= block.size())
         if (file.write(block.constData(), qMin<qint64>(left, block.size())) < 0)

@@ -6,6 +6,7 @@
 #include "MediaGenerator.h"
 
 #include <QDir>
+#include <QJsonObject>
 
 namespace {
 
@@ -42,31 +43,48 @@ TEST_P(RepeatedUse, OpenAndCancelAtOnce) {
     }
 }
 
+// Each round checks what the fakes cannot show: the real player's end, the
+// range stopping at its end handle, the save switching to the clip.
 TEST_P(RepeatedUse, TheTypicalUse) {
+    const QByteArray original = hashOf(recording());
     for (int round = 0; round < kTypicalUsePerBatch; ++round) {
+        SCOPED_TRACE(testing::Message() << "round " << round);
         const Run run = edit(R"(
 wait ready
 tap videoOverlayPlayButton
 wait playing
 wait paused 30
+dump
 drag end 1.2
 tap playButton
 wait playing
 wait paused 30
+dump
 tap videoOverlay
 sleep 0.2
 tap trimButton
 wait exporting=false 30
+dump
 tap doneButton
 )");
         expectNormalEnd(run, round);
-        EXPECT_EQ(run.hostReport, kSavedToAlbumReport) << "round " << round;
+        ASSERT_EQ(run.dumps.size(), 3) << run.out.toStdString();
+        const QJsonObject &ended = run.dumps[0], &range = run.dumps[1], &saved = run.dumps[2];
+        EXPECT_FALSE(ended["introMode"].toBool() || ended["uiHidden"].toBool());
+        EXPECT_NEAR(ended["currentTime"].toDouble(), 0.0, 0.05) << "back to zero at the end";
+        EXPECT_TRUE(range["trimming"].toBool());
+        EXPECT_NEAR(range["currentTime"].toDouble(), range["editEndTime"].toDouble(), 0.2);
+        EXPECT_FALSE(saved["trimming"].toBool() || saved["exporting"].toBool());
+        EXPECT_TRUE(
+            saved["videoURL"].toString().startsWith("/private/var/mobile/Library/Tamsel//Racer_"));
+        EXPECT_EQ(run.hostReport, kSavedToAlbumReport);
         // Done the instant the save finished: the tear-down's removal of the
         // clip must not overtake the album's import of it.
-        EXPECT_EQ(albumFiles().size(), round + 1) << "round " << round;
+        EXPECT_EQ(albumFiles().size(), round + 1);
         expectWholeClipsOnly(1.2);
-        EXPECT_TRUE(tempFiles().isEmpty()) << "round " << round;
+        EXPECT_TRUE(tempFiles().isEmpty()) << tempFiles().join(", ").toStdString();
     }
+    EXPECT_EQ(hashOf(recording()), original) << "the host's movie is never modified";
 }
 
 INSTANTIATE_TEST_SUITE_P(Batches, RepeatedUse, ::testing::Range(0, kBatches));

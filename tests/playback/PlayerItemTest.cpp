@@ -90,16 +90,10 @@ TEST(PlaybackPlayerItem, WhatIsNotAMovieFailsWithAnError) {
     QBuffer buffer(&png);
     buffer.open(QIODevice::WriteOnly);
     QImage(64, 48, QImage::Format_RGB32).save(&buffer, "PNG");
-    testmedia::MovieSpec truncated = plain(1);
-    truncated.truncated = true; // an MP4 cut short before its sample tables
+    // What the asset refuses is MediaOpening's; these FFmpeg would open.
     const QList<QUrl> urls = {
-        fileWithBytes("notes.txt", "these are\nnot frames\n"),
         fileWithBytes("list.m3u", "#EXTM3U\n" + clip(1).toLocalFile().toUtf8() + "\n"),
-        fileWithBytes("empty.mp4", QByteArray()),
         fileWithBytes("still.png", png),
-        clipUrl("truncated", truncated),
-        QUrl::fromLocalFile("/nonexistent/nowhere.mp4"),
-        QUrl("https://example.invalid/movie.mp4"),
     };
     testing_support::LogCapture log;
     for (const QUrl& url : urls) {
