@@ -27,7 +27,7 @@ target_link_libraries(tamsel-test-export PRIVATE tamsel_platform_media tamsel_wa
 
 tamsel_add_tests(tamsel_media_integration_tests integration
   SOURCES
-    media/GeneratedMovieTest.cpp
+    media/AssetTest.cpp
     media/ImageGeneratorTest.cpp
     media/MediaOpeningTest.cpp
     media/ExportSessionTest.cpp

@@ -27,15 +27,3 @@ tamsel_add_tests(tamsel_overlay_tests unit
     ui/ProgressOverlayTest.cpp
   LIBS tamsel_overlay tamsel_youtube Qt6::Test
   MAIN tamsel_ui_test_main)
-
-if(TARGET tamsel-ui-gallery)
-  find_program(TAMSEL_XVFB_RUN xvfb-run)
-  if(TAMSEL_XVFB_RUN)
-    tamsel_add_tests(tamsel_ui_gallery_tests integration
-      SOURCES ui/GalleryScreenshotTest.cpp
-      MAIN tamsel_ui_test_main)
-    target_compile_definitions(tamsel_ui_gallery_tests PRIVATE
-      TAMSEL_GALLERY="$<TARGET_FILE:tamsel-ui-gallery>" TAMSEL_XVFB_RUN="${TAMSEL_XVFB_RUN}")
-    add_dependencies(tamsel_ui_gallery_tests tamsel-ui-gallery)
-  endif()
-endif()

@@ -43,9 +43,6 @@ class PrincipalTest : public ::testing::Test {
     void request(const QList<ExtensionItem>& items) {
         auto [extensionEnd, hostEnd] = makeSocketPair();
         host = std::make_unique<MessageChannel>(hostEnd);
-        host->onMessage = [this](const QCborMap& m) {
-            reports.append(m.value("arguments").toArray().at(0).toArray());
-        };
         context = std::make_shared<TXVideoEditorExtensionContext>(
             items, std::make_shared<AuxiliaryConnection>(
                        std::make_shared<MessageChannel>(extensionEnd),
@@ -70,7 +67,6 @@ class PrincipalTest : public ::testing::Test {
     std::unique_ptr<MessageChannel> host;
     std::shared_ptr<TXVideoEditorExtensionContext> context;
     std::shared_ptr<TXVideoEditorExtensionViewController> principal;
-    QList<QCborArray> reports;
 };
 
 } // namespace
@@ -128,17 +124,4 @@ TEST_F(PrincipalTest, AppearingBuildsOnceAndDisappearingTearsDown) {
     EXPECT_TRUE(principal->childViewControllers().isEmpty());
     principal->viewDidDisappear(false);
     EXPECT_EQ(logs.count("TXVideoEditorExtensionViewController -viewDidDisappear:"), 2);
-}
-
-TEST_F(PrincipalTest, TheEditorsReportGoesToTheHostUnchanged) {
-    request(required);
-    ASSERT_TRUE(waitUntil([&] { return bool(editor()); }));
-    editor()->activityTypes = {"org.tamsel.activity.SaveToAlbum", "TXPublishToYouTube"};
-    editor()->doneAction();
-    ASSERT_TRUE(waitUntil([&] { return reports.size() == 1; }));
-    EXPECT_EQ(reports[0], (QCborArray{"org.tamsel.activity.SaveToAlbum", "TXPublishToYouTube"}));
-    EXPECT_EQ(
-        logs.count(
-            "TXVideoEditorExtensionViewController -videoEditorViewDidFinishWithActivityTypes:"),
-        1);
 }

@@ -1,6 +1,6 @@
-// The image generator's tolerances, scaling and cancellation; its strip on
-// every kind of recording is checked in RecordingKindsTest, its failures in
-// MediaOpeningTest.
+// The image generator's scaling, cancellation and exact requests; its strip
+// (keyframes, the editor's default) on every kind of recording is checked in
+// RecordingKindsTest, its failures in MediaOpeningTest.
 
 #include "platform/media/ImageGenerator.h"
 #include "MediaFixtures.h"
@@ -58,39 +58,6 @@ std::shared_ptr<ImageGenerator> generatorFor(const testmedia::MovieSpec& movieSp
 
 } // namespace
 
-// By default the keyframe at or before each time (past the end: the last
-// one); with no tolerance the frame shown at the time. With reordered frames
-// too, where a keyframe is shown after it is decoded.
-TEST(ImageGenerator, GivesTheKeyframeByDefaultAndTheShownFrameWithoutTolerance) {
-    const QList<double> times = {0.0, 1.0, 1.9, 2.5, 3.99, 60.0};
-    const struct {
-        int bFrames;
-        bool exact;
-        std::vector<int> expected;
-    } cases[] = {{0, false, {0, 30, 30, 60, 90, 90}},
-                 {2, false, {0, 30, 30, 60, 90, 90}},
-                 {2, true, {0, 30, 57, 75, 119, 119}}};
-    for (const auto& c : cases) {
-        SCOPED_TRACE(testing::Message() << c.bFrames << " B-frames, exact " << c.exact);
-        auto generator = generatorFor({.seconds = 4, .bFrames = c.bFrames});
-        if (c.exact) {
-            generator->setRequestedTimeToleranceBefore(MediaTime::zero());
-            generator->setRequestedTimeToleranceAfter(MediaTime::zero());
-        }
-        const auto done = generate(*generator, times);
-        ASSERT_EQ(done.size(), size_t(times.size()));
-        for (size_t i = 0; i < done.size(); ++i) {
-            SCOPED_TRACE(times[int(i)]);
-            EXPECT_EQ(done[i].result, ImageGeneratorResult::Succeeded);
-            EXPECT_FALSE(done[i].error);
-            EXPECT_EQ(done[i].requested, MediaTime::fromSeconds(times[int(i)], 600));
-            EXPECT_EQ(testmedia::readFrameIndex(done[i].image), c.expected[i]);
-            EXPECT_NEAR(done[i].actual.seconds(), c.expected[i] / 30.0, 1e-6);
-            EXPECT_NE(done[i].thread, std::this_thread::get_id());
-        }
-    }
-}
-
 TEST(ImageGenerator, ScalesIntoTheMaximumSizeKeepingTheAspectAndTurnsWhenAsked) {
     auto generator = generatorFor({.height = 180, .rotationDegrees = 90});
     generator->setMaximumSize(QSizeF(64, 64));
@@ -125,7 +92,17 @@ TEST(ImageGenerator, CancelCompletesWhatIsPendingAsCancelledAndLaterRequestsAreS
     }
     // At most the one already under way finishes.
     EXPECT_GE(cancelled, 39);
-    const auto after = generate(*generator, {1.0});
-    ASSERT_EQ(after.size(), 1u);
-    EXPECT_EQ(after[0].result, ImageGeneratorResult::Succeeded);
+    // Later requests are served, off the main thread, exactly when asked for
+    // (the frame shown at the time, not a keyframe).
+    const auto after = generate(*generator, {1.9, 3.99});
+    ASSERT_EQ(after.size(), 2u);
+    for (const Completion& c : after) {
+        EXPECT_EQ(c.result, ImageGeneratorResult::Succeeded);
+        EXPECT_FALSE(c.error);
+        EXPECT_NE(c.thread, std::this_thread::get_id());
+    }
+    EXPECT_EQ(after[0].requested, MediaTime::fromSeconds(1.9, 600));
+    EXPECT_EQ(testmedia::readFrameIndex(after[0].image), 57);
+    EXPECT_EQ(testmedia::readFrameIndex(after[1].image), 119);
+    EXPECT_NEAR(after[1].actual.seconds(), 119 / 30.0, 1e-6);
 }

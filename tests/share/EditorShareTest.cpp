@@ -4,7 +4,6 @@
 
 #include "ShareFakes.h"
 #include "platform/services/ActivityTypes.h"
-#include "platform/ui/Device.h"
 #include "platform/ui/Window.h"
 #include "support/Wait.h"
 #include "unit/editor/EditorOnFakes.h"
@@ -30,11 +29,11 @@ class EditorShareTest : public EditorOnFakes {
         EditorOnFakes::TearDown();
     }
 
-    // Makes the editor and waits until it is on screen in a window of `size`.
-    void show(QSize size = QSize(900, 600)) {
+    // Makes the editor and waits until it is on screen in a wide window.
+    void show() {
         makeEditor();
         window = std::make_unique<Window>();
-        window->resize(size);
+        window->resize(900, 600);
         window->setRootViewController(editor);
         window->show();
         ASSERT_TRUE(waitUntil(
@@ -152,16 +151,4 @@ TEST_F(EditorShareTest, CompletedActivitiesAreRecordedEachTimeAndOthersNot) {
 
     editor->doneAction();
     EXPECT_EQ(delegate->reports, (QList<QStringList>{{MailActivityType, MailActivityType}}));
-}
-
-TEST_F(EditorShareTest, OnAPhoneTheSheetFillsTheWindow) {
-    Device::setInterfaceIdiomOverride(Device::InterfaceIdiom::Phone);
-    show(QSize(390, 700));
-    ASSERT_FALSE(editor->isPadMode());
-    const std::string before = bottom();
-    const auto sheet = share();
-    ASSERT_TRUE(sheet);
-    EXPECT_EQ(sheet->modalPresentationStyle(), ViewController::ModalPresentationStyle::FullScreen);
-    EXPECT_EQ(top(), "done | title | save");
-    EXPECT_EQ(bottom(), before);
 }
