@@ -75,6 +75,11 @@ void TXVideoEditorViewController::init(const QString& bundleIdentifier, const QU
         View::setFrameOf(button, QRectF(QPointF(screen.width() * 0.5 - size.width() * 0.5,
                                                 screen.height() * 0.5 - size.height() * 0.5),
                                         size));
+        // The main screen is the window, which the user resizes: margins that
+        // share the change keep the button where it was put, in the middle.
+        View::setAutoresizingMaskOf(button, View::FlexibleLeftMargin | View::FlexibleRightMargin |
+                                                View::FlexibleTopMargin |
+                                                View::FlexibleBottomMargin);
         videoOverlayPlayButton->setTarget_action(this, QByteArrayLiteral("playAction"));
     }
 

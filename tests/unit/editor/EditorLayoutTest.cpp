@@ -52,6 +52,8 @@ TEST_F(EditorLayout, APhoneFollowsTheWindowsShapeAndATransitionRemakesTheThumbna
     EXPECT_EQ(editor->bottomToolBar->superview(), editor->view());
     EXPECT_NE(editor->thumbnailGenerator, old) << "thumbnails are made again at the new size";
     EXPECT_EQ(editor->avPlayerLayer->frame(), QRect(0, 0, 300, 600));
+    EXPECT_EQ(View::frameOf(editor->videoOverlayPlayButtonView.get()).center(), QPointF(150, 300))
+        << "the play button stays in the middle of the window";
 }
 
 TEST_F(EditorLayout, ATapOnTheVideoTogglesTheChrome) {
