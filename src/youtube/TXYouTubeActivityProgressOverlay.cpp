@@ -12,6 +12,9 @@ TXYouTubeActivityProgressOverlay::TXYouTubeActivityProgressOverlay(const QRectF&
                                                                    QWidget* parent)
     : View(frame, parent) {
     setAccessibleName(tr("Publishing"));
+    // Laid over a screen in a window the user may resize while the upload
+    // runs: the dimming keeps covering it and the spinner its middle.
+    setAutoresizingMask(FlexibleWidth | FlexibleHeight);
 }
 
 void TXYouTubeActivityProgressOverlay::setShowing_animated(bool showing, bool animated) {
@@ -28,6 +31,7 @@ void TXYouTubeActivityProgressOverlay::setupOverlayAnimated(bool) {
     auto* dimming = new View(bounds());
     addSubview(dimming);
     dimming->setBackgroundColor(QColor::fromRgbF(0.0f, 0.0f, 0.0f, 0.5f));
+    dimming->setAutoresizingMask(FlexibleWidth | FlexibleHeight);
     setAlpha(0.0);
 
     QPointer<TXYouTubeActivityProgressOverlay> self(this);
@@ -41,6 +45,8 @@ void TXYouTubeActivityProgressOverlay::setupOverlayAnimated(bool) {
             indicator->startAnimating();
             const QRectF bounds = self->bounds();
             indicator->setCenter(QPointF(bounds.width() * 0.5, bounds.height() * 0.5));
+            indicator->setAutoresizingMask(FlexibleLeftMargin | FlexibleRightMargin |
+                                           FlexibleTopMargin | FlexibleBottomMargin);
             self->addSubview(indicator);
         });
 }

@@ -58,6 +58,17 @@ TEST(UiProgressOverlay, ShowingFadesInOnceThenCentresASpinningIndicatorUntilStop
         // Centred in the overlay's own bounds, whatever its origin in the screen.
         EXPECT_EQ(spinner->center(), QPointF(100, 50));
         EXPECT_DOUBLE_EQ(presentationAlpha(screen.overlay.get()), 1.0);
+        // The window grows: the dimming still covers the screen, the spinner
+        // stays in its middle.
+        screen.root.setFrame(QRectF(0, 0, 420, 580));
+        EXPECT_EQ(screen.overlay->frame(), QRectF(20, 40, 300, 200));
+        for (QObject* child : screen.overlay->children()) {
+            if (child->metaObject() == &View::staticMetaObject) {
+                EXPECT_EQ(View::frameOf(static_cast<QWidget*>(child)), QRectF(0, 0, 300, 200));
+            }
+        }
+        EXPECT_EQ(spinner->center(), QPointF(150, 100));
+        screen.root.setFrame(QRectF(0, 0, 320, 480));
 
         screen.overlay->stopActivity();
         screen.deleteDeferred(); // would delete a dropped spinner
