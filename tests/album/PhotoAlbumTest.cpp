@@ -214,19 +214,3 @@ TEST_F(PhotoAlbumTest, ARemovalAskedAfterASaveWaitsUntilTheImportHasTheFile) {
     EXPECT_EQ(entries(folder), QStringList{"Racer_1.mp4"});
     EXPECT_EQ(hashOf(folder + "/Racer_1.mp4"), hashOf(movie()));
 }
-
-TEST_F(PhotoAlbumTest, ANameThatStartsWithADotIsNotHiddenInTheAlbum) {
-    const QStringList sources = {"..\u2215..\u2215evil_1.mp4", "..._2.mp4", ".mp4"};
-    const QStringList expected = {"Video.mp4", "_2.mp4", "evil_1.mp4"};
-    for (const QString& name : sources) {
-        const QString path = albumRoot.filePath(name);
-        ASSERT_TRUE(QFile::copy(movie(), path));
-        ErrorPtr error;
-        EXPECT_FALSE(album.importVideo(path, &error).isEmpty()) << name.toStdString();
-    }
-    QStringList names = entries(folder);
-    for (QString& name : names)
-        name = name.section(QChar(0x2215), -1);
-    names.sort();
-    EXPECT_EQ(names, expected);
-}

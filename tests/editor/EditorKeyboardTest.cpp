@@ -2,7 +2,6 @@
 // through the buttons' actions and the scrubber's calls.
 
 #include "EditorKeyboard.h"
-#include "platform/services/ActivityTypes.h"
 #include "platform/ui/Window.h"
 #include "support/Wait.h"
 #include "unit/editor/EditorOnFakes.h"
@@ -113,12 +112,6 @@ TEST_F(EditorKeyboardTest, ArrowsStepFramesAndTheRangeKeepsItsLeastLength) {
     EXPECT_NEAR(editor->editEndTime, frame + 1.0, 1e-6);
     type(Qt::Key_Escape); // nothing left to cancel
     EXPECT_FALSE(editor->isTrimming());
-}
-
-// Ctrl+S while trimming is the end-to-end keyboard test's.
-TEST_F(EditorKeyboardTest, CtrlSSavesAsTheSaveButtonDoes) {
-    type(Qt::Key_S, Qt::ControlModifier);
-    EXPECT_TRUE(waitUntil([&] { return editor->activityTypes.contains(SaveToAlbumActivityType); }));
 }
 
 TEST_F(EditorKeyboardTest, KeysWaitWhileASheetCoversTheEditor) {

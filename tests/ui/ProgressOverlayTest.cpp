@@ -21,10 +21,12 @@ struct Screen {
         root.addSubview(overlay.get());
     }
     // Plain child views: the dimming layers.
-    int dimmingLayers() const {
-        return int(std::count_if(
-            overlay->children().begin(), overlay->children().end(),
-            [](QObject* child) { return child->metaObject() == &View::staticMetaObject; }));
+    QList<QWidget*> dimmingLayers() const {
+        QList<QWidget*> layers;
+        for (QObject* child : overlay->children())
+            if (child->metaObject() == &View::staticMetaObject)
+                layers.append(static_cast<QWidget*>(child));
+        return layers;
     }
     bool spinnerShown() const {
         return overlay->activityIndicator() &&
@@ -45,7 +47,7 @@ TEST(UiProgressOverlay, ShowingFadesInOnceThenCentresASpinningIndicatorUntilStop
         screen.overlay->setShowing_animated(true, animated);
         screen.overlay->setShowing_animated(true, animated);
         EXPECT_TRUE(screen.overlay->isShowing());
-        EXPECT_EQ(screen.dimmingLayers(), 1);
+        EXPECT_EQ(screen.dimmingLayers().size(), 1);
         EXPECT_TRUE(platform::Animation::isAnimating(screen.overlay.get())) << "it always fades";
         EXPECT_LT(presentationAlpha(screen.overlay.get()), 1.0);
         EXPECT_EQ(screen.overlay->activityIndicator(), nullptr);
@@ -62,20 +64,15 @@ TEST(UiProgressOverlay, ShowingFadesInOnceThenCentresASpinningIndicatorUntilStop
         // stays in its middle.
         screen.root.setFrame(QRectF(0, 0, 420, 580));
         EXPECT_EQ(screen.overlay->frame(), QRectF(20, 40, 300, 200));
-        for (QObject* child : screen.overlay->children()) {
-            if (child->metaObject() == &View::staticMetaObject) {
-                EXPECT_EQ(View::frameOf(static_cast<QWidget*>(child)), QRectF(0, 0, 300, 200));
-            }
-        }
+        EXPECT_EQ(View::frameOf(screen.dimmingLayers().value(0)), QRectF(0, 0, 300, 200));
         EXPECT_EQ(spinner->center(), QPointF(150, 100));
-        screen.root.setFrame(QRectF(0, 0, 320, 480));
 
         screen.overlay->stopActivity();
         screen.deleteDeferred(); // would delete a dropped spinner
         ASSERT_TRUE(spinner);
         EXPECT_EQ(spinner->parentWidget(), nullptr);
         EXPECT_EQ(screen.overlay->activityIndicator(), spinner.data());
-        EXPECT_EQ(screen.dimmingLayers(), 1);
+        EXPECT_EQ(screen.dimmingLayers().size(), 1);
         EXPECT_EQ(screen.overlay->parentWidget(), &screen.root);
     }
 }
