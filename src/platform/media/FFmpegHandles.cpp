@@ -4,6 +4,7 @@
 
 #include <QFile>
 
+#include <algorithm>
 #include <cerrno>
 #include <fcntl.h>
 #include <mutex>
@@ -11,6 +12,34 @@
 #include <unistd.h>
 
 namespace platform::ffmpeg {
+
+namespace {
+
+// What probing works out when it runs: the movie's start, the earliest of
+// its streams', and its length, to the end of the last one (AV_TIME_BASE
+// units). Times a hostile file makes overflow are left unknown.
+void takeMovieTimesFromStreams(AVFormatContext* input) {
+    std::int64_t first = INT64_MAX, last = INT64_MIN;
+    for (unsigned i = 0; i < input->nb_streams; ++i) {
+        const AVStream* stream = input->streams[i];
+        const std::int64_t start =
+            av_rescale_q(stream->start_time, stream->time_base, AV_TIME_BASE_Q);
+        first = std::min(first, start);
+        std::int64_t end = 0;
+        if (stream->duration != AV_NOPTS_VALUE &&
+            !__builtin_add_overflow(
+                start, av_rescale_q(stream->duration, stream->time_base, AV_TIME_BASE_Q), &end))
+            last = std::max(last, end);
+    }
+    if (input->start_time == AV_NOPTS_VALUE && first != INT64_MAX)
+        input->start_time = first;
+    std::int64_t length = 0;
+    if (input->duration == AV_NOPTS_VALUE && last != INT64_MIN && first != INT64_MAX &&
+        !__builtin_sub_overflow(last, first, &length) && length > 0)
+        input->duration = length;
+}
+
+} // namespace
 
 QString errorText(int averror) {
     if (averror == kNotARegularFile)
@@ -60,15 +89,22 @@ InputPtr openInputAsIs(const QString& hostPath, int* averror) {
         return {};
     }
     InputPtr input(raw);
-    // Probing decodes the start of each stream, so it runs only when the
-    // headers leave out a parameter we read: a video stream's size or pixel
-    // format, an audio stream's sample rate. The MP4 and Matroska demuxers
-    // leave the pixel format unset for H.264 and VP9, so in practice a file
-    // with video is probed, MP4 included; a file with only audio is not.
+    // Probing decodes the start of each stream (tens of milliseconds for a
+    // large picture), so it runs only when the headers leave out a parameter
+    // something reads: a video stream's size, an audio stream's sample rate,
+    // or the pixel format that an MP4 VP8 or VP9 configuration box is made
+    // from. H.264 and HEVC carry theirs in their own configuration, which is
+    // copied as it is, so a plain recording opens on its headers alone.
     bool complete = input->nb_streams > 0;
     for (unsigned i = 0; i < input->nb_streams; ++i) {
-        const AVCodecParameters* p = input->streams[i]->codecpar;
-        if ((p->codec_type == AVMEDIA_TYPE_VIDEO && (p->width <= 0 || p->format < 0)) ||
+        const AVStream* stream = input->streams[i];
+        const AVCodecParameters* p = stream->codecpar;
+        if (stream->start_time == AV_NOPTS_VALUE)
+            complete = false;
+        const bool formatInConfiguration =
+            p->codec_id == AV_CODEC_ID_H264 || p->codec_id == AV_CODEC_ID_HEVC;
+        if ((p->codec_type == AVMEDIA_TYPE_VIDEO &&
+             (p->width <= 0 || (p->format < 0 && !formatInConfiguration))) ||
             (p->codec_type == AVMEDIA_TYPE_AUDIO && p->sample_rate <= 0))
             complete = false;
     }
@@ -77,6 +113,8 @@ InputPtr openInputAsIs(const QString& hostPath, int* averror) {
             *averror = err;
         return {};
     }
+    if (complete)
+        takeMovieTimesFromStreams(input.get());
     return input;
 }
 
