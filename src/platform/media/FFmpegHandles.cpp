@@ -90,11 +90,13 @@ InputPtr openInputAsIs(const QString& hostPath, int* averror) {
     }
     InputPtr input(raw);
     // Probing decodes the start of each stream (tens of milliseconds for a
-    // large picture), so it runs only when the headers leave out a parameter
-    // something reads: a video stream's size, an audio stream's sample rate,
-    // or the pixel format that an MP4 VP8 or VP9 configuration box is made
-    // from. H.264 and HEVC carry theirs in their own configuration, which is
-    // copied as it is, so a plain recording opens on its headers alone.
+    // large picture), so it runs only when the headers leave out something
+    // we read: a stream's start time (Matroska's B-frames, say), a video
+    // stream's size, an audio stream's sample rate, or the pixel format that
+    // an MP4 VP8 or VP9 configuration box is made from. H.264 and HEVC carry
+    // theirs in their own configuration, which is copied as it is, so a plain
+    // MP4 recording opens on its headers alone; the movie's start and length
+    // are then reckoned from its streams, as probing would.
     bool complete = input->nb_streams > 0;
     for (unsigned i = 0; i < input->nb_streams; ++i) {
         const AVStream* stream = input->streams[i];
