@@ -156,8 +156,11 @@ void MpvPlayer::handleFileLoaded() {
     double duration = 0;
     if (mpv_get_property(core_->handle(), "duration", MPV_FORMAT_DOUBLE, &duration) >= 0)
         item_->setDurationSeconds(duration);
-    refreshPosition();
-    crossingFrom_ = position_.value_or(0);
+    // A file is loaded at its start. What libmpv reports at this moment
+    // depends on whether it has decoded the first picture yet, which can
+    // stand a few milliseconds after the start (behind Opus's pre-skip, say).
+    position_ = 0.0;
+    crossingFrom_ = 0.0;
     if (seek_.pending && !seek_.issued)
         issueSeek();
     item_->setStatus(PlayerItem::Status::ReadyToPlay);
